@@ -1,0 +1,60 @@
+// Labels of single files and of directory trees.
+#include "core/diagnostics.h"
+#include "core/directory_stream.h"
+#include "labels/security_attribute.h"
+#include "platform/tavon_strcat.h"
+
+namespace SecPolicy {
+
+using Tavon::Lib::TavonException;
+using Tavon::Misc::StrCat;
+using ZekCtl::Security::kObjectLabel;
+
+namespace {
+
+// Links, sockets and entries of unreported type are left alone.
+bool IsLabelled(unsigned char type) {
+  switch (type) {
+    case DT_REG:
+    case DT_DIR:
+    case DT_CHR:
+    case DT_BLK:
+    case DT_FIFO:
+      return true;
+    default:
+      return false;
+  }
+}
+
+}  // namespace
+
+int SetFileLabel(std::string path, std::string label, ZekAccessInterfaceImpl& iface) {
+  const int result = ReplaceLabelId(path, iface.LookupLabel(label, kObjectLabel));
+  if (result < 0) {
+    throw TavonException(
+        StrCat("Unable to set file label (", label, ") for file ", path, ": ", SystemReason()));
+  }
+  return result;
+}
+
+void SetDirLabelRecursive(std::string dir, std::string label, ZekAccessInterfaceImpl& iface) {
+  SetFileLabel(dir, label, iface);
+  DirectoryStream directory(dir);
+  if (!directory.IsOpen()) throw TavonException("Unable to open directory " + dir);
+  while (const auto entry = directory.Next()) {
+    if (!IsLabelled(entry->type)) continue;
+    const std::string path = dir + "/" + entry->name;
+    SetFileLabel(path, label, iface);
+    if (entry->type == DT_DIR) SetDirLabelRecursive(path, label, iface);
+  }
+}
+
+std::string GetFileLabel(std::string path, ZekAccessInterfaceImpl& iface) {
+  const auto id = ReadLabelId(path);
+  if (!id) {
+    throw TavonException(StrCat("Unable to get file label for file ", path, ":", SystemReason()));
+  }
+  return iface.GetLabel(*id, kObjectLabel);
+}
+
+}  // namespace SecPolicy
