@@ -1,0 +1,57 @@
+#include "tardisk/backing_tardisk.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <string_view>
+
+#include "platform/sysinfo.h"
+#include "platform/tavon_exception.h"
+
+namespace SecPolicy {
+
+using Tavon::Lib::TavonException;
+
+namespace {
+
+class OpenFile {
+ public:
+  explicit OpenFile(const std::string& path)
+      : descriptor_(open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
+    if (descriptor_ < 0) throw TavonException("Unable to open policy file " + path);
+  }
+  ~OpenFile() { close(descriptor_); }
+  OpenFile(const OpenFile&) = delete;
+  OpenFile& operator=(const OpenFile&) = delete;
+
+  [[nodiscard]] int Descriptor() const noexcept { return descriptor_; }
+
+ private:
+  int descriptor_;
+};
+
+ZekCtl::Util::InodeStats ReadInodeStats(unsigned long inode) {
+  ZekCtl::Util::InodeStats stats{};
+  ZekCtl::Util::Sysinfo service(ZekCtl::Util::kInodeStatsNode);
+  service.AddInstancePath(inode);
+  service.Get(&stats, sizeof stats);
+  return stats;
+}
+
+}  // namespace
+
+std::string BackingTardiskPath(const std::string& policyFile) {
+  const OpenFile file(policyFile);
+  struct stat attributes {};
+  if (fstat(file.Descriptor(), &attributes) != 0) {
+    throw TavonException("Unable to get attributes for policy file " + policyFile);
+  }
+  const ZekCtl::Util::InodeStats stats = ReadInodeStats(attributes.st_ino);
+  // The reply is not trusted to end in a NUL.
+  const std::string_view field(stats.tardiskName, sizeof stats.tardiskName);
+  const std::string_view name = field.substr(0, field.find('\0'));
+  return name.empty() ? std::string() : kTardiskDir + std::string(name);
+}
+
+}  // namespace SecPolicy
