@@ -1,0 +1,196 @@
+#include "host/json/json_cursor.h"
+
+#include <algorithm>
+#include <limits>
+#include <set>
+#include <string_view>
+
+#include "host/host_error.h"
+#include "platform/tavon_strcat.h"
+
+namespace StandIn {
+
+using nlohmann::json;
+using Tavon::Misc::StrCat;
+
+namespace {
+
+// Refuses, while a document is parsed, what the parser itself would pass over.
+class ParseGuard {
+ public:
+  explicit ParseGuard(const std::string& file) : file_(file) {}
+
+  // Always true: nothing is left out of the document.
+  bool operator()(int depth, json::parse_event_t event, json& parsed) {
+    if (depth >= kDeepestNesting) {
+      throw HostError(
+          StrCat(file_, ": is nested more than ", kDeepestNesting, " arrays and objects deep"));
+    }
+    if (event == json::parse_event_t::object_start) {
+      keys_.emplace_back();
+    } else if (event == json::parse_event_t::object_end) {
+      keys_.pop_back();
+    } else if (event == json::parse_event_t::key) {
+      const auto& key = parsed.get_ref<const std::string&>();
+      if (!keys_.back().insert(key).second) {
+        throw HostError(StrCat(file_, ": gives the member \"", key, "\" of one object twice"));
+      }
+    }
+    return true;
+  }
+
+ private:
+  const std::string& file_;
+  std::vector<std::set<std::string>> keys_;  // of the objects that are open
+};
+
+// The line and column of the last of the first `bytes` bytes of `text`, as editors count them.
+std::string LineAndColumn(std::string_view text, std::size_t bytes) {
+  const std::string_view before = text.substr(0, bytes == 0 ? 0 : bytes - 1);
+  const auto lines = std::count(before.begin(), before.end(), '\n');
+  const std::size_t lineStart = before.rfind('\n') + 1;  // npos wraps to the first line's start
+  return StrCat(lines + 1, ":", before.size() - lineStart + 1);
+}
+
+// The parser's text behind `prefix`: without its own name for the error and its count of lines.
+std::string Cause(const json::exception& error, std::string_view prefix) {
+  const std::string text = error.what();
+  const std::size_t found = text.find(prefix);
+  return found == std::string::npos ? text : text.substr(found + prefix.size());
+}
+
+// Appends to `place` the place of `sought` within `value`; says whether it is there. Places are
+// asked for only when something is wrong, so that cursors need not carry them.
+bool FindPlace(const json& value, const json& sought, json::json_pointer& place) {
+  if (&value == &sought) {
+    return true;
+  }
+  std::size_t index = 0;
+  for (auto item = value.begin(); value.is_structured() && item != value.end(); ++item) {
+    if (value.is_object()) {
+      place /= item.key();
+    } else {
+      place /= index++;
+    }
+    if (FindPlace(*item, sought, place)) {
+      return true;
+    }
+    place.pop_back();
+  }
+  return false;
+}
+
+}  // namespace
+
+json ParseJson(const std::string& text, const std::string& file) {
+  try {
+    ParseGuard guard(file);
+    return json::parse(text, [&guard](int depth, json::parse_event_t event, json& parsed) {
+      return guard(depth, event, parsed);
+    });
+  } catch (const json::parse_error& error) {
+    throw HostError(StrCat(file, ":", LineAndColumn(text, error.byte), ": ", Cause(error, ": ")));
+  } catch (const json::out_of_range& error) {
+    throw HostError(StrCat(file, ": ", Cause(error, "] ")));
+  }
+}
+
+JsonCursor::JsonCursor(const json& document, std::string file)
+    : value_(&document),
+      document_(&document),
+      file_(std::make_shared<const std::string>(std::move(file))) {}
+
+JsonCursor::JsonCursor(const json& value, const JsonCursor& from)
+    : value_(&value), document_(from.document_), file_(from.file_) {}
+
+JsonCursor JsonCursor::Member(const std::string& key) const {
+  const std::optional<JsonCursor> member = Find(key);
+  if (!member) {
+    Fail(StrCat("lacks the member \"", key, "\""));
+  }
+  return *member;
+}
+
+std::optional<JsonCursor> JsonCursor::Find(const std::string& key) const {
+  if (!value_->is_object()) {
+    Fail("must be an object");
+  }
+  const auto found = value_->find(key);
+  if (found == value_->end()) {
+    return std::nullopt;
+  }
+  return JsonCursor(*found, *this);
+}
+
+void JsonCursor::AllowOnly(std::initializer_list<const char*> keys) const {
+  for (const auto& [key, member] : Members()) {
+    if (std::find(keys.begin(), keys.end(), key) == keys.end()) {
+      member.Fail("unknown member");
+    }
+  }
+}
+
+std::vector<JsonCursor> JsonCursor::Items() const {
+  if (!value_->is_array()) {
+    Fail("must be an array");
+  }
+  std::vector<JsonCursor> items;
+  items.reserve(value_->size());
+  for (const json& item : *value_) {
+    items.push_back(JsonCursor(item, *this));
+  }
+  return items;
+}
+
+std::vector<std::pair<std::string, JsonCursor>> JsonCursor::Members() const {
+  if (!value_->is_object()) {
+    Fail("must be an object");
+  }
+  std::vector<std::pair<std::string, JsonCursor>> members;
+  for (const auto& [key, member] : value_->items()) {
+    members.emplace_back(key, JsonCursor(member, *this));
+  }
+  return members;
+}
+
+std::string JsonCursor::String() const {
+  if (!IsString()) {
+    Fail("must be a string");
+  }
+  return value_->get<std::string>();
+}
+
+std::uint64_t JsonCursor::Unsigned(std::uint64_t least, std::uint64_t most) const {
+  const std::uint64_t number = value_->is_number_unsigned() ? value_->get<std::uint64_t>() : 0;
+  if (!value_->is_number_unsigned() || number < least || number > most) {
+    Fail(StrCat("must be a whole number from ", least, " to ", most));
+  }
+  return number;
+}
+
+std::vector<std::string> JsonCursor::Strings() const {
+  std::vector<std::string> strings;
+  for (const JsonCursor& item : Items()) {
+    strings.push_back(item.String());
+  }
+  return strings;
+}
+
+bool JsonCursor::IsString() const { return value_->is_string(); }
+
+void JsonCursor::Fail(const std::string& what) const {
+  json::json_pointer place;
+  FindPlace(*document_, *value_, place);
+  const std::string text = place.to_string();
+  throw HostError(StrCat(*file_, ": ", text.empty() ? "/" : text, ": ", what));
+}
+
+void ExpectFormat(const JsonCursor& document, std::uint64_t known) {
+  const JsonCursor format = document.Member("format");
+  const std::uint64_t found = format.Unsigned(0, std::numeric_limits<std::uint64_t>::max());
+  if (found != known) {
+    format.Fail(StrCat("format ", found, " is not known here, only format ", known));
+  }
+}
+
+}  // namespace StandIn

@@ -1,0 +1,66 @@
+// Reading of JSON documents that says where a value is wrong.
+#pragma once
+
+#include <cstdint>
+#include <initializer_list>
+#include <memory>
+#include <nlohmann/json.hpp>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace StandIn {
+
+// How deeply arrays and objects may be nested.
+inline constexpr int kDeepestNesting = 64;
+
+// Parses `text`, the content of `file`. Throws HostError "FILE:LINE:COLUMN: " and what the parser
+// found there; "FILE: " and why when a member is given twice or the nesting is too deep.
+nlohmann::json ParseJson(const std::string& text, const std::string& file);
+
+// A value within a document. Every reading function throws HostError "FILE: PLACE: " and what is
+// wrong, where PLACE is the value's JSON pointer ("/" for the whole). A cursor refers to the
+// document that it was made from, which must outlive it and stay unchanged; cursors are cheap to
+// copy and do not depend on one another.
+class JsonCursor {
+ public:
+  JsonCursor(const nlohmann::json& document, std::string file);
+  JsonCursor(const nlohmann::json&& document, std::string file) = delete;  // would dangle
+
+  // The member `key`, which must be there / may be there. The value must be an object.
+  [[nodiscard]] JsonCursor Member(const std::string& key) const;
+  [[nodiscard]] std::optional<JsonCursor> Find(const std::string& key) const;
+  // Refuses members other than these, so that a misspelt key is not passed over.
+  void AllowOnly(std::initializer_list<const char*> keys) const;
+  // The elements of an array; the members of an object with their keys, in the keys' byte order.
+  [[nodiscard]] std::vector<JsonCursor> Items() const;
+  [[nodiscard]] std::vector<std::pair<std::string, JsonCursor>> Members() const;
+
+  // The value as the type named. Numbers must lie between `least` and `most`, both included.
+  [[nodiscard]] std::string String() const;
+  [[nodiscard]] std::uint64_t Unsigned(std::uint64_t least, std::uint64_t most) const;
+  [[nodiscard]] std::vector<std::string> Strings() const;
+  [[nodiscard]] bool IsString() const;
+
+  // Throws the HostError for this value with the text `what`.
+  [[noreturn]] void Fail(const std::string& what) const;
+
+ private:
+  JsonCursor(const nlohmann::json& value, const JsonCursor& from);
+
+  const nlohmann::json* value_;
+  const nlohmann::json* document_;
+  std::shared_ptr<const std::string> file_;
+};
+
+// Refuses a document whose member "format" is not the number `known`.
+void ExpectFormat(const JsonCursor& document, std::uint64_t known);
+
+// Names and paths are bytes, JSON strings are Unicode: bytes from 0x80 and the percent sign are
+// kept as %XX, so that any name survives. DecodeBytes throws HostError through `place.Fail` at a
+// malformed escape.
+std::string EncodeBytes(const std::string& bytes);
+std::string DecodeBytes(const JsonCursor& place);
+
+}  // namespace StandIn

@@ -1,0 +1,55 @@
+#include "host/module/rule_book.h"
+
+namespace StandIn {
+
+namespace {
+
+constexpr std::size_t kTransitions = static_cast<std::size_t>(RuleKind::kTransition);
+
+}  // namespace
+
+const RuleTable* RuleBook::TableOf(RuleKind kind, DomainId domain) const {
+  const auto found = domains_.find(domain);
+  return found == domains_.end() ? nullptr : &found->second[static_cast<std::size_t>(kind)];
+}
+
+void RuleBook::Set(RuleKind kind, DomainId domain, const Rule& rule) {
+  const auto replaced = domains_[domain][static_cast<std::size_t>(kind)].Set(rule);
+  if (kind == RuleKind::kTransition) {
+    ++transitionsInto_[rule.targetDomain];
+    if (replaced) {
+      --transitionsInto_[*replaced];
+    }
+  }
+}
+
+bool RuleBook::Holds(RuleKind kind, DomainId domain, const std::vector<std::string>& words) const {
+  const RuleTable* const table = TableOf(kind, domain);
+  return table != nullptr && table->Holds(words);
+}
+
+std::vector<Rule> RuleBook::Rules(RuleKind kind, DomainId domain) const {
+  const RuleTable* const table = TableOf(kind, domain);
+  return table == nullptr ? std::vector<Rule>() : table->Rules();
+}
+
+std::uint32_t RuleBook::TransitionsInto(DomainId domain) const {
+  const auto found = transitionsInto_.find(domain);
+  return found == transitionsInto_.end() ? 0 : found->second;
+}
+
+void RuleBook::ForgetDomain(DomainId domain) {
+  for (const Rule& transition : Rules(RuleKind::kTransition, domain)) {
+    --transitionsInto_[transition.targetDomain];
+  }
+  domains_.erase(domain);
+  if (TransitionsInto(domain) == 0) {
+    return;
+  }
+  for (auto& [other, tables] : domains_) {
+    tables[kTransitions].DropTarget(domain);
+  }
+  transitionsInto_.erase(domain);
+}
+
+}  // namespace StandIn

@@ -1,0 +1,37 @@
+// The rules of all domains, file rules aside.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <map>
+#include <vector>
+
+#include "host/module/rule.h"
+#include "host/module/rule_table.h"
+
+namespace StandIn {
+
+// Judges nothing: domains and words are the caller's to check.
+class RuleBook {
+ public:
+  // As RuleTable::Set.
+  void Set(RuleKind kind, DomainId domain, const Rule& rule);
+  [[nodiscard]] bool Holds(RuleKind kind, DomainId domain,
+                           const std::vector<std::string>& words) const;
+  [[nodiscard]] std::vector<Rule> Rules(RuleKind kind, DomainId domain) const;
+
+  // How many transitions, of all domains, lead into the domain.
+  [[nodiscard]] std::uint32_t TransitionsInto(DomainId domain) const;
+  // Drops the domain's rules and every domain's transitions into it.
+  void ForgetDomain(DomainId domain);
+
+ private:
+  using DomainRules = std::array<RuleTable, kRuleKinds>;
+
+  [[nodiscard]] const RuleTable* TableOf(RuleKind kind, DomainId domain) const;
+
+  std::map<DomainId, DomainRules> domains_;
+  std::map<DomainId, std::uint32_t> transitionsInto_;
+};
+
+}  // namespace StandIn

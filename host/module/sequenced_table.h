@@ -1,0 +1,78 @@
+// Records that keep the order in which they came and are found by a key.
+#pragma once
+
+#include <list>
+#include <utility>
+
+namespace StandIn {
+
+// `Index` maps keys to places (std::list<Record>::iterator); its keys may refer into the records,
+// which stay where they are until they are erased. `KeyOf` gives a record's key. A record's key
+// must not be changed in place: take it out with Rekey.
+template <typename Record, typename Index, auto KeyOf>
+class SequencedTable {
+ public:
+  using Key = typename Index::key_type;
+
+  SequencedTable() = default;
+  SequencedTable(SequencedTable&&) = default;
+  SequencedTable& operator=(SequencedTable&&) = default;
+
+  [[nodiscard]] std::size_t Size() const { return records_.size(); }
+  [[nodiscard]] const std::list<Record>& Records() const { return records_; }
+  [[nodiscard]] const Index& ByKey() const { return index_; }
+
+  // nullptr when there is none. Valid until the record is erased.
+  [[nodiscard]] Record* Find(const Key& key) const {
+    const auto found = index_.find(key);
+    return found == index_.end() ? nullptr : &*found->second;
+  }
+
+  // Puts a record behind the last. No record may have its key.
+  void Append(Record record) {
+    records_.push_back(std::move(record));
+    index_.emplace(KeyOf(records_.back()), std::prev(records_.end()));
+  }
+
+  // False when there is none.
+  bool Erase(const Key& key) {
+    const auto found = index_.find(key);
+    if (found == index_.end()) {
+      return false;
+    }
+    const auto place = found->second;
+    index_.erase(found);
+    records_.erase(place);
+    return true;
+  }
+
+  // Erases every record that `matches` is true for; gives their number.
+  template <typename Predicate>
+  std::size_t EraseIf(Predicate matches) {
+    const std::size_t before = records_.size();
+    for (auto place = records_.begin(); place != records_.end();) {
+      const auto current = place++;
+      if (matches(std::as_const(*current))) {
+        Erase(KeyOf(*current));
+      }
+    }
+    return before - records_.size();
+  }
+
+  // Lets `change` give the record at `key`, which must be there, another key, which none may have.
+  // The record keeps its place in the order.
+  template <typename Change>
+  void Rekey(const Key& key, Change change) {
+    const auto found = index_.find(key);
+    const auto place = found->second;
+    index_.erase(found);
+    change(*place);
+    index_.emplace(KeyOf(*place), place);
+  }
+
+ private:
+  std::list<Record> records_;
+  Index index_;
+};
+
+}  // namespace StandIn

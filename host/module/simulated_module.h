@@ -1,0 +1,86 @@
+// The security module, simulated: it decides and remembers as a kernel would, and enforces nothing.
+#pragma once
+
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "host/module/module_description.h"
+#include "host/module/module_state.h"
+#include "host/module/process_table.h"
+#include "host/module/security_module.h"
+
+namespace StandIn {
+
+// Beside what SecurityModule says: slot 0 holds the predefined domain `rootDom`. A number that is
+// no label type, word list or kind of rule is refused with EINVAL.
+class SimulatedModule final : public SecurityModule {
+ public:
+  // `processes` must outlive the module. The description is one that ReadDescription gives, or as
+  // good. ModuleError when a predefined label's name will not do or there are too many.
+  SimulatedModule(ModuleDescription description, const ProcessTable& processes);
+
+  // What the module holds, as JSON text: the same for the same contents. state_json.h says its
+  // shape.
+  [[nodiscard]] std::string Save() const;
+  // Takes over what another module of a like description saved to `file`. HostError, and everything
+  // is as it was, when `text` is not such or does not fit the description.
+  void Restore(const std::string& text, const std::string& file);
+
+  std::optional<DomainId> FindDomain(const std::string& name) override;
+  DomainId CreateDomain(const std::string& name, DomainOrigin origin) override;
+  void DestroyDomain(DomainId domain) override;
+  std::string DomainName(DomainId domain) override;
+  std::optional<DomainInfo> GetDomainInfo(DomainId domain) override;
+  std::uint32_t MaxDomains() override;
+  std::vector<DomainId> LeakedDomains() override;
+  void SetDomainRole(DomainRole role, DomainId domain) override;
+  void AddService(DomainId domain, const std::string& service) override;
+
+  DomainId WorldDomain(WorldId world) override;
+  void PlaceWorld(WorldId world, DomainId domain) override;
+
+  void ValidateWord(WordList list, const std::string& word) override;
+  std::map<std::string, long> Words(WordList list) override;
+
+  void SetRule(RuleKind kind, DomainId domain, const Rule& rule) override;
+  std::vector<Rule> Rules(RuleKind kind, DomainId domain) override;
+  void CheckCapabilityParams(const std::string& domainName,
+                             const std::vector<Rule>& rules) override;
+
+  std::vector<std::string> InvalidLabels(LabelType type) override;
+  void AddLabels(const std::vector<std::string>& labels, LabelType type) override;
+  void RemoveLabels(const std::vector<std::string>& labels, LabelType type) override;
+  bool IsPredefinedLabel(const std::string& label, LabelType type) override;
+  bool IsPrivilegedVm(const std::string& name) override;
+  LabelId LookupLabel(const std::string& label, LabelType type) override;
+  std::string LabelName(LabelId label, LabelType type) override;
+
+  void AddFileRules(DomainId domain, const std::vector<FileRule>& rules,
+                    std::uint32_t& taken) override;
+  void RemoveFileRule(WorldId world, DomainId domain, const std::string& path) override;
+  void UpdateFileRule(DomainId domain, const std::string& path, std::uint32_t permission) override;
+  void ReplacePath(const std::string& oldPath, const std::string& newPath) override;
+  std::uint32_t CountFileRules(DomainId domain) override;
+  std::vector<FileRule> FileRules(DomainId domain) override;
+
+  void SetFileLabel(const std::string& path, LabelId label) override;
+  LabelId FileLabel(const std::string& path) override;
+
+  std::string Tardisk(TardiskWord word) override;
+
+ private:
+  [[nodiscard]] WorldId Self() const;
+  [[nodiscard]] std::uint32_t WorldsIn(DomainId domain) const;
+  [[nodiscard]] LabelTable& Labels(LabelType type) const;
+  void CheckFileRule(DomainId domain, const FileRule& rule) const;
+
+  const ModuleDescription description_;
+  const ProcessTable& processes_;
+  std::map<WordList, std::map<std::string, long>> words_;  // all lists but kObjects
+  std::unique_ptr<ModuleState> state_;                     // never null
+};
+
+}  // namespace StandIn

@@ -1,0 +1,75 @@
+// The operations of the simulated module on words and on rules that consist of words.
+#include <cerrno>
+
+#include "host/module/module_error.h"
+#include "host/module/rule_check.h"
+#include "host/module/simulated_module.h"
+#include "host/module/word_lists.h"
+#include "platform/tavon_strcat.h"
+
+namespace StandIn {
+
+using Tavon::Misc::StrCat;
+
+namespace {
+
+void RequireList(WordList list) {
+  if (InfoOf(list) == nullptr) {
+    throw ModuleError(EINVAL, StrCat("no word list has the number ", static_cast<unsigned>(list)));
+  }
+}
+
+void RequireKind(RuleKind kind) {
+  if (static_cast<std::size_t>(kind) >= kRuleKinds) {
+    throw ModuleError(EINVAL,
+                      StrCat("no kind of rules has the number ", static_cast<unsigned>(kind)));
+  }
+}
+
+}  // namespace
+
+void SimulatedModule::ValidateWord(WordList list, const std::string& word) {
+  RequireList(list);
+  if (list == WordList::kObjects) {
+    if (const LabelTable& objects = Labels(LabelType::kObject); !objects.Defines(word)) {
+      throw ModuleError(EINVAL, UnknownWordText(list, word, objects.Names()));
+    }
+    return;
+  }
+  if (!words_[list].contains(word)) {
+    const auto words = description_.words.find(list);
+    throw ModuleError(EINVAL,
+                      UnknownWordText(list, word,
+                                      words == description_.words.end() ? std::vector<std::string>()
+                                                                        : words->second));
+  }
+}
+
+std::map<std::string, long> SimulatedModule::Words(WordList list) {
+  RequireList(list);
+  return list == WordList::kObjects ? Labels(LabelType::kObject).Ids() : words_[list];
+}
+
+void SimulatedModule::SetRule(RuleKind kind, DomainId domain, const Rule& rule) {
+  RequireKind(kind);
+  state_->domains.Require(domain);
+  CheckRuleWords(kind, rule,
+                 [this](WordList list, const std::string& word) { ValidateWord(list, word); });
+  if (kind == RuleKind::kTransition) {
+    state_->domains.Require(rule.targetDomain);
+  }
+  state_->rules.Set(kind, domain, rule);
+}
+
+std::vector<Rule> SimulatedModule::Rules(RuleKind kind, DomainId domain) {
+  RequireKind(kind);
+  state_->domains.Require(domain);
+  return state_->rules.Rules(kind, domain);
+}
+
+void SimulatedModule::CheckCapabilityParams(const std::string& domainName,
+                                            const std::vector<Rule>& rules) {
+  CheckCapabilityContradictions(domainName, rules);
+}
+
+}  // namespace StandIn

@@ -1,0 +1,86 @@
+#include "host/module/state_rows.h"
+
+#include <optional>
+
+#include "host/module/json_names.h"
+#include "host/module/permission_letters.h"
+#include "host/module/state_fields.h"
+#include "platform/tavon_strcat.h"
+
+namespace StandIn {
+
+using nlohmann::json;
+using Tavon::Misc::StrCat;
+
+namespace {
+
+constexpr char kGranted[] = "grant";
+constexpr char kRevoked[] = "revoke";
+
+RuleKind ReadRuleKind(const JsonCursor& place) {
+  const std::string keyword = place.String();
+  for (std::size_t i = 0; i < kRuleKinds; ++i) {
+    if (keyword == kRuleKindInfo[i].keyword) {
+      return static_cast<RuleKind>(i);
+    }
+  }
+  place.Fail(StrCat("no kind of rules has the keyword \"", keyword, "\""));
+}
+
+Decision ReadDecision(const JsonCursor& place) {
+  const std::string word = place.String();
+  if (word != kGranted && word != kRevoked) {
+    place.Fail(StrCat("must be \"", kGranted, "\" or \"", kRevoked, "\""));
+  }
+  return word == kGranted ? Decision::kGrant : Decision::kRevoke;
+}
+
+}  // namespace
+
+json RuleRow(RuleKind kind, const Rule& rule) {
+  json row{InfoOf(kind).keyword, rule.line};
+  for (const std::string& word : rule.words) {
+    row.push_back(EncodeBytes(word));
+  }
+  if (kind == RuleKind::kTransition) {
+    row.push_back(rule.targetDomain);
+  }
+  row.push_back(rule.decision == Decision::kGrant ? kGranted : kRevoked);
+  return row;
+}
+
+json FileRuleRow(const FileRule& rule) {
+  return {rule.world, EncodeBytes(rule.path), PermissionLetters(rule.permission)};
+}
+
+std::pair<RuleKind, Rule> ReadRuleRow(const JsonCursor& place, const DomainTable& domains) {
+  const std::vector<JsonCursor> start = place.Items();
+  if (start.empty()) {
+    place.Fail("must begin with the keyword of a kind of rules");
+  }
+  const RuleKind kind = ReadRuleKind(start[0]);
+  const std::size_t words = InfoOf(kind).words;
+  const std::size_t targets = kind == RuleKind::kTransition ? 1 : 0;
+  const std::vector<JsonCursor> row = RowOf(place, 2 + words + targets + 1);
+  Rule rule;
+  rule.line = Read32(row[1], 0, kMost32);
+  for (std::size_t i = 0; i < words; ++i) {
+    rule.words.push_back(ReadNonEmpty(row[2 + i]));
+  }
+  if (targets != 0) {
+    rule.targetDomain = ReadDomainId(row[2 + words], domains);
+  }
+  rule.decision = ReadDecision(row.back());
+  return {kind, std::move(rule)};
+}
+
+FileRule ReadFileRuleRow(const JsonCursor& place) {
+  const std::vector<JsonCursor> row = RowOf(place, 3);
+  const auto permission = PermissionOfLetters(row[2].String());
+  if (!permission) {
+    row[2].Fail("must be letters of \"rwx\", in this order");
+  }
+  return {ReadWorld(row[0], 0), ReadPath(row[1]), *permission};
+}
+
+}  // namespace StandIn
