@@ -1,0 +1,114 @@
+#include "host/gate/ordinary_call_answers.h"
+
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <sys/xattr.h>
+
+#include <cerrno>
+#include <climits>
+#include <cstdlib>
+#include <memory>
+#include <new>
+#include <optional>
+#include <string>
+
+#include "host/gate/passthrough.h"
+#include "host/gate/user_memory.h"
+#include "host/module/module_error.h"
+#include "platform/private_calls.h"
+
+namespace StandIn {
+
+namespace {
+
+// Runs `answer`; what it throws becomes a negative errno.
+template <typename Answer>
+long AsResult(const Answer& answer) noexcept try {
+  return answer();
+} catch (const ModuleError& refusal) {
+  return refusal.Number() != 0 ? -refusal.Number() : -EIO;
+} catch (const BadArgument& argument) {
+  return -argument.number;
+} catch (const std::bad_alloc&) {
+  return -ENOMEM;
+} catch (...) {
+  return -EIO;
+}
+
+std::string RealPath(const std::string& path) {
+  const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(path.c_str(), nullptr),
+                                                             &std::free);
+  if (!resolved) throw BadArgument{errno};
+  return resolved.get();
+}
+
+// Whether the caller means the label's attribute. A name that cannot be read is left to the kernel
+// to refuse.
+bool NamesLabel(std::uint64_t name) {
+  try {
+    return ReadString(name, XATTR_NAME_MAX + 1) == ZekCtl::Kernel::kLabelAttribute;
+  } catch (const BadArgument&) {
+    return false;
+  }
+}
+
+// The path within the image of the file that the caller names; nothing for a file outside.
+std::optional<std::string> ImagePath(const AttachedHost& host, std::uint64_t address) {
+  const std::string path = ReadString(address, PATH_MAX);
+  struct stat status {};
+  if (stat(path.c_str(), &status) != 0) throw BadArgument{errno};
+  return host.files.PathOf(status.st_dev, status.st_ino);
+}
+
+// Every file of the image carries the label from the start, every other file never.
+void CheckFlags(std::uint64_t flags, bool carriesLabel) {
+  if ((flags & ~static_cast<std::uint64_t>(XATTR_CREATE | XATTR_REPLACE)) != 0 ||
+      flags == (XATTR_CREATE | XATTR_REPLACE)) {
+    throw BadArgument{EINVAL};
+  }
+  if (carriesLabel && flags == XATTR_CREATE) throw BadArgument{EEXIST};
+  if (!carriesLabel) throw BadArgument{flags == XATTR_REPLACE ? ENODATA : EOPNOTSUPP};
+}
+
+}  // namespace
+
+long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments) noexcept {
+  return AsResult([&]() -> long {
+    const std::string path = ReadString(arguments[1], ZekCtl::Kernel::kPathBytes);
+    const std::string resolved = host.point.Pass(
+        Operation::kResolvePath, [&] { return path; }, [&] { return RealPath(path); });
+    if (resolved.size() >= ZekCtl::Kernel::kPathBytes) throw BadArgument{ENAMETOOLONG};
+    WriteMemory(arguments[2], resolved.c_str(), resolved.size() + 1);
+    return 0;
+  });
+}
+
+long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
+  const auto& [path, name, value, size, flags, unused] = arguments;
+  if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_setxattr, arguments.data());
+  return AsResult([&, value = value, size = size, flags = flags, path = path]() -> long {
+    const auto imagePath = ImagePath(host, path);
+    CheckFlags(flags, imagePath.has_value());
+    LabelId label = 0;
+    if (size != sizeof label) throw BadArgument{EINVAL};
+    ReadMemory(value, &label, sizeof label);
+    host.module.SetFileLabel(*imagePath, label);
+    return 0;
+  });
+}
+
+long AnswerGetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
+  const auto& [path, name, value, size, unused1, unused2] = arguments;
+  if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
+  return AsResult([&, value = value, size = size, path = path]() -> long {
+    const auto imagePath = ImagePath(host, path);
+    if (!imagePath) throw BadArgument{ENODATA};
+    const LabelId label = host.module.FileLabel(*imagePath);
+    if (size == 0) return sizeof label;
+    if (size < sizeof label) throw BadArgument{ERANGE};
+    WriteMemory(value, &label, sizeof label);
+    return sizeof label;
+  });
+}
+
+}  // namespace StandIn
