@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
+#include <cstring>
 #include <memory>
 #include <new>
 #include <optional>
@@ -16,8 +17,11 @@
 #include "host/gate/user_memory.h"
 #include "host/module/module_error.h"
 #include "platform/private_calls.h"
+#include "platform/tavon_strcat.h"
 
 namespace StandIn {
+
+using Tavon::Misc::StrCat;
 
 namespace {
 
@@ -35,11 +39,17 @@ long AsResult(const Answer& answer) noexcept try {
   return -EIO;
 }
 
+[[noreturn]] void RefuseToResolve(const std::string& path, int number) {
+  throw ModuleError(number, StrCat("\"", path, "\" cannot be resolved: ", std::strerror(number)));
+}
+
 std::string RealPath(const std::string& path) {
-  const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(path.c_str(), nullptr),
-                                                             &std::free);
-  if (!resolved) throw BadArgument{errno};
-  return resolved.get();
+  const std::unique_ptr<char, decltype(&std::free)> found(realpath(path.c_str(), nullptr),
+                                                          &std::free);
+  if (!found) RefuseToResolve(path, errno);
+  std::string resolved = found.get();
+  if (resolved.size() >= ZekCtl::Kernel::kPathBytes) RefuseToResolve(path, ENAMETOOLONG);
+  return resolved;
 }
 
 // Whether the caller means the label's attribute. A name that cannot be read is left to the kernel
@@ -77,7 +87,6 @@ long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments)
     const std::string path = ReadString(arguments[1], ZekCtl::Kernel::kPathBytes);
     const std::string resolved = host.point.Pass(
         Operation::kResolvePath, [&] { return path; }, [&] { return RealPath(path); });
-    if (resolved.size() >= ZekCtl::Kernel::kPathBytes) throw BadArgument{ENAMETOOLONG};
     WriteMemory(arguments[2], resolved.c_str(), resolved.size() + 1);
     return 0;
   });

@@ -1,0 +1,168 @@
+#include "host/image/assemble.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdio>
+#include <string_view>
+
+#include "host/image/file_io.h"
+#include "host/image/image_index.h"
+#include "host/image/image_layout.h"
+#include "host/image/quoted_name.h"
+#include "host/image/remove_tree.h"
+#include "host/image/state_file.h"
+#include "host/image/system_failure.h"
+#include "host/image/tree_writer.h"
+#include "host/image/unpack.h"
+
+namespace StandIn {
+
+namespace {
+
+constexpr mode_t kSharedDirectoryMode = 0755;
+constexpr mode_t kArchiveCopyMode = 0644;
+
+// The names of the archives in byte order.
+std::vector<std::string> ArchiveNames(const DirectoryRef& archives) {
+  std::vector<std::string> names = ListDirectory(archives);
+  std::sort(names.begin(), names.end());
+  std::string others;
+  for (const std::string& name : names) {
+    struct stat status;
+    if (::fstatat(archives.fd, name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
+      const int number = errno;
+      throw SystemFailure(archives.PathOf(name), "read", number);
+    }
+    if (!S_ISREG(status.st_mode)) {
+      others += (others.empty() ? "" : ", ") + QuotedName(name);
+    }
+  }
+  if (!others.empty()) {
+    throw HostError(archives.path + ": not a regular file: " + others);
+  }
+  return names;
+}
+
+UniqueFd OpenArchive(const DirectoryRef& archives, const std::string& name) {
+  UniqueFd fd(::openat(archives.fd, name.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
+  if (!fd.IsOpen()) {
+    const int number = errno;
+    throw SystemFailure(archives.PathOf(name), "opened", number);
+  }
+  return fd;
+}
+
+// The root file system in the making: a directory that vanishes unless it is put into place.
+class NewRoot {
+ public:
+  explicit NewRoot(const HostDirectory& host) : host_(host.Ref()) {
+    RemoveTree(host_, kNewRootDirectory);
+    if (::mkdirat(host_.fd, kNewRootDirectory, S_IRWXU) != 0) {
+      const int number = errno;
+      throw SystemFailure(host_.PathOf(kNewRootDirectory), "made", number);
+    }
+    fd_ = OpenDirectory(host_, kNewRootDirectory);
+    const TreeWriter tree = Writer();
+    tree.SetDirectoryMode("/", kSharedDirectoryMode);
+    tree.MakeDirectory(kArchivesPath, kSharedDirectoryMode);
+  }
+  ~NewRoot() {
+    try {
+      RemoveTree(host_, kNewRootDirectory);
+    } catch (const HostError&) {
+      // The next assembly tries again, and says why when it can't either.
+    }
+  }
+  NewRoot(const NewRoot&) = delete;
+  NewRoot& operator=(const NewRoot&) = delete;
+
+  [[nodiscard]] TreeWriter Writer() const {
+    return TreeWriter({fd_.Get(), host_.PathOf(kNewRootDirectory)});
+  }
+
+  void AddArchive(const DirectoryRef& archives, const std::string& name) const {
+    const std::string path = std::string(kArchivesPath) + "/" + name;
+    if (::linkat(archives.fd, name.c_str(), fd_.Get(), path.c_str() + 1, 0) != 0) {
+      CopyArchive(archives, name, path);
+    }
+  }
+
+  // Exchanges it with the root file system that is there, which vanishes in its stead.
+  void PutIntoPlace() const {
+    const bool isSynced = ::syncfs(fd_.Get()) == 0;
+    const bool isPlaced = isSynced && (Rename(RENAME_EXCHANGE) || (errno == ENOENT && Rename(0)));
+    if (!isPlaced) {
+      const int number = errno;
+      throw SystemFailure(host_.PathOf(kRootDirectory), "put into place", number);
+    }
+  }
+
+ private:
+  [[nodiscard]] bool Rename(unsigned int flags) const {
+    return ::renameat2(host_.fd, kNewRootDirectory, host_.fd, kRootDirectory, flags) == 0;
+  }
+
+  void CopyArchive(const DirectoryRef& archives, const std::string& name,
+                   const std::string& path) const {
+    const UniqueFd source = OpenArchive(archives, name);
+    NewFile copy = Writer().MakeFile(path);
+    std::uint64_t size = 0;
+    ReadBlocks(source.Get(), archives.PathOf(name), [&](std::string_view block) {
+      copy.WriteAt(size, block);
+      size += block.size();
+    });
+    copy.Finish(size, kArchiveCopyMode);
+  }
+
+  DirectoryRef host_;
+  UniqueFd fd_;
+};
+
+// Unpacks everything into `root`, filling `report`.
+ImageIndex UnpackAll(const DirectoryRef& archives, const NewRoot& root, const UnpackLimits& limits,
+                     AssembleReport& report) {
+  UnpackBudget budget(limits);
+  ImageLayout layout;
+  const TreeWriter tree = root.Writer();
+  for (const std::string& name : ArchiveNames(archives)) {
+    const UniqueFd fd = OpenArchive(archives, name);
+    const std::uint64_t entries =
+        Unpack({fd.Get(), name, archives.PathOf(name)}, budget, layout, tree);
+    root.AddArchive(archives, name);
+    report.tardisks.push_back({name, entries});
+    report.entries += entries;
+  }
+  return layout.Index();
+}
+
+void RemoveIndex(const DirectoryRef& host) {
+  if (::unlinkat(host.fd, kIndexFile, 0) != 0 && errno != ENOENT) {
+    const int number = errno;
+    throw SystemFailure(host.PathOf(kIndexFile), "removed", number);
+  }
+}
+
+}  // namespace
+
+AssembleReport Assemble(const HostDirectory& host, const UnpackLimits& limits) {
+  StateFile state(host);
+  const StateFile::Lock lock(state, LockMode::kExclusive);
+  const UniqueFd fd = OpenDirectory(host.Ref(), kTardiskDirectory);
+  const DirectoryRef archives{fd.Get(), host.Ref().PathOf(kTardiskDirectory)};
+
+  AssembleReport report;
+  const NewRoot root(host);
+  const ImageIndex index = UnpackAll(archives, root, limits, report);
+  // Without an index the host counts as not assembled, which is right while root/, the index and
+  // the state don't belong together.
+  RemoveIndex(host.Ref());
+  root.PutIntoPlace();
+  state.Remove();
+  ReplaceFile(host.Ref(), kIndexFile, FormatImageIndex(index));
+  return report;
+}
+
+}  // namespace StandIn

@@ -1,0 +1,137 @@
+#include "host/image/file_io.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <array>
+#include <cerrno>
+#include <cstdio>
+
+#include "host/image/system_failure.h"
+#include "host/image/unique_fd.h"
+
+namespace StandIn {
+
+namespace {
+
+// A file that vanishes at the end of its scope unless it has been given its final name.
+class TemporaryFile {
+ public:
+  TemporaryFile(int dirFd, const std::string& finalName)
+      : dirFd_(dirFd), name_(finalName + ".new." + std::to_string(::getpid())) {}
+  ~TemporaryFile() {
+    if (exists_) {
+      ::unlinkat(dirFd_, name_.c_str(), 0);
+    }
+  }
+  TemporaryFile(const TemporaryFile&) = delete;
+  TemporaryFile& operator=(const TemporaryFile&) = delete;
+
+  // Each returns 0 or an errno.
+  int Make() {
+    // A process of the same id may have been killed half-way; what it left holds nothing of use.
+    ::unlinkat(dirFd_, name_.c_str(), 0);
+    fd_ = UniqueFd(::openat(dirFd_, name_.c_str(),
+                            O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0666));
+    exists_ = fd_.IsOpen();
+    return exists_ ? 0 : errno;
+  }
+
+  int Fill(std::string_view text) {
+    while (!text.empty()) {
+      const ssize_t written = ::write(fd_.Get(), text.data(), text.size());
+      if (written < 0) {
+        if (errno == EINTR) {
+          continue;
+        }
+        return errno;
+      }
+      text.remove_prefix(static_cast<std::size_t>(written));
+    }
+    return ::fsync(fd_.Get()) == 0 ? 0 : errno;
+  }
+
+  int TakeName(const std::string& finalName) {
+    if (::renameat(dirFd_, name_.c_str(), dirFd_, finalName.c_str()) != 0) {
+      return errno;
+    }
+    exists_ = false;
+    return 0;
+  }
+
+ private:
+  int dirFd_;
+  std::string name_;
+  UniqueFd fd_;
+  bool exists_ = false;
+};
+
+}  // namespace
+
+void ReadBlocks(int fd, const std::string& file,
+                const std::function<void(std::string_view block)>& sink) {
+  std::array<char, 65536> buffer;
+  for (;;) {
+    const ssize_t got = ::read(fd, buffer.data(), buffer.size());
+    if (got == 0) {
+      return;
+    }
+    if (got > 0) {
+      sink({buffer.data(), static_cast<std::size_t>(got)});
+    } else if (errno != EINTR) {
+      throw SystemFailure(file, "read", errno);
+    }
+  }
+}
+
+std::string ReadAll(int fd, const std::string& file) {
+  std::string text;
+  ReadBlocks(fd, file, [&](std::string_view block) { text += block; });
+  return text;
+}
+
+std::optional<std::string> ReadFileIfThere(const DirectoryRef& dir, const std::string& name) {
+  const std::string file = dir.PathOf(name);
+  // Without O_NONBLOCK a fifo of that name would hold the caller up for ever.
+  const UniqueFd fd(::openat(dir.fd, name.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  if (!fd.IsOpen()) {
+    if (errno == ENOENT) {
+      return std::nullopt;
+    }
+    throw SystemFailure(file, "opened", errno);
+  }
+  struct stat status;
+  if (::fstat(fd.Get(), &status) != 0) {
+    throw SystemFailure(file, "read", errno);
+  }
+  if (!S_ISREG(status.st_mode)) {
+    throw HostError(file + ": not a regular file");
+  }
+  return ReadAll(fd.Get(), file);
+}
+
+std::string ReadFile(const DirectoryRef& dir, const std::string& name) {
+  std::optional<std::string> text = ReadFileIfThere(dir, name);
+  if (!text) {
+    throw SystemFailure(dir.PathOf(name), "opened", ENOENT);
+  }
+  return *std::move(text);
+}
+
+void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text) {
+  const auto check = [&](int number) {
+    if (number != 0) {
+      throw SystemFailure(dir.PathOf(name), "written", number);
+    }
+  };
+  // Opened first: a directory that cannot be synced must be found out before anything is renamed.
+  const UniqueFd directory(::openat(dir.fd, ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  check(directory.IsOpen() ? 0 : errno);
+  TemporaryFile file(directory.Get(), name);
+  check(file.Make());
+  check(file.Fill(text));
+  check(file.TakeName(name));
+  check(::fsync(directory.Get()) == 0 ? 0 : errno);
+}
+
+}  // namespace StandIn

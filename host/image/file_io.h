@@ -1,0 +1,40 @@
+// Reading and replacing of whole files.
+#pragma once
+
+#include <functional>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "host/image/directory.h"
+
+namespace StandIn {
+
+// The content of the regular file `name` in `dir`; nothing when there is no such file. Throws
+// HostError "DIR/NAME: cannot be opened: REASON", "...: cannot be read: REASON" or "DIR/NAME: not a
+// regular file".
+std::optional<std::string> ReadFileIfThere(const DirectoryRef& dir, const std::string& name);
+
+// As above for a file that has to be there: its absence is HostError "DIR/NAME: cannot be opened:
+// No such file or directory".
+std::string ReadFile(const DirectoryRef& dir, const std::string& name);
+
+// Hands over the open file `fd`, which messages call `file`, from its current position to its end.
+// Throws HostError "FILE: cannot be read: REASON".
+void ReadBlocks(int fd, const std::string& file,
+                const std::function<void(std::string_view block)>& sink);
+
+// The same as one text.
+std::string ReadAll(int fd, const std::string& file);
+
+// Gives the file `name` in `dir` the content `text`: as a new file, which is synced and then takes
+// the name, whereupon the directory is synced. Whoever reads the name sees the old content or the
+// new one whole, also when this process or the machine stops at any moment. Two processes may
+// replace one file at a time: the later one wins.
+//
+// Throws HostError "DIR/NAME: cannot be written: REASON". The old file is then untouched and
+// nothing of the new one remains (except when the last step, syncing the directory, failed: the new
+// content has the name then, but may not survive a power failure).
+void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text);
+
+}  // namespace StandIn

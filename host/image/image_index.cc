@@ -1,0 +1,89 @@
+#include "host/image/image_index.h"
+
+#include <nlohmann/json.hpp>
+#include <unordered_set>
+
+#include "host/image/entry_path.h"
+#include "host/image/quoted_name.h"
+#include "host/json/json_cursor.h"
+
+namespace StandIn {
+
+namespace {
+
+bool IsPathOfArchives(const std::string& path) {
+  return IsPathBelowRoot(path) && path != kArchivesPath &&
+         !path.starts_with(std::string(kArchivesPath) + "/");
+}
+
+bool IsFileName(const std::string& name) {
+  return IsPathBelowRoot("/" + name) && name.find('/') == std::string::npos;
+}
+
+// Reads the archives one after another, refusing what another one has.
+class IndexReader {
+ public:
+  TardiskContent Read(const JsonCursor& place) {
+    place.AllowOnly({"name", "paths"});
+    TardiskContent content;
+    content.name = ReadName(place.Member("name"));
+    for (const JsonCursor& path : place.Member("paths").Items()) {
+      content.paths.push_back(ReadPath(path));
+    }
+    return content;
+  }
+
+ private:
+  std::string ReadName(const JsonCursor& place) {
+    std::string name = DecodeBytes(place);
+    if (!IsFileName(name)) {
+      place.Fail(QuotedName(name) + " is not a file name");
+    }
+    if (!names_.insert(name).second) {
+      place.Fail(QuotedName(name) + " stands twice");
+    }
+    return name;
+  }
+
+  std::string ReadPath(const JsonCursor& place) {
+    std::string path = DecodeBytes(place);
+    if (!IsPathOfArchives(path)) {
+      place.Fail(QuotedName(path) + " is not a path that an archive can bring");
+    }
+    if (!paths_.insert(path).second) {
+      place.Fail(QuotedName(path) + " stands twice");
+    }
+    return path;
+  }
+
+  std::unordered_set<std::string> names_;
+  std::unordered_set<std::string> paths_;
+};
+
+}  // namespace
+
+std::string FormatImageIndex(const ImageIndex& index) {
+  nlohmann::json tardisks = nlohmann::json::array();
+  for (const TardiskContent& content : index.tardisks) {
+    nlohmann::json paths = nlohmann::json::array();
+    for (const std::string& path : content.paths) {
+      paths.push_back(EncodeBytes(path));
+    }
+    tardisks.push_back({{"name", EncodeBytes(content.name)}, {"paths", std::move(paths)}});
+  }
+  return nlohmann::json{{"tardisks", std::move(tardisks)}}.dump(1) + "\n";
+}
+
+ImageIndex ParseImageIndex(const std::string& text, const std::string& file) {
+  const nlohmann::json document = ParseJson(text, file);
+  const JsonCursor whole(document, file);
+  whole.AllowOnly({"tardisks"});
+  ImageIndex index;
+  IndexReader reader;
+  for (const JsonCursor& place : whole.Member("tardisks").Items()) {
+    index.tardisks.push_back(reader.Read(place));
+  }
+  return index;
+}
+
+}  // namespace StandIn

@@ -1,0 +1,58 @@
+#include "host/image/session.h"
+
+#include <utility>
+
+#include "host/gate/gate.h"
+#include "host/host_error.h"
+#include "host/image/change_root.h"
+#include "host/module/description_json.h"
+
+namespace StandIn {
+
+namespace {
+
+ModuleDescription DescriptionOf(const HostDirectory& host) {
+  return ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile));
+}
+
+RootIndex FilesOf(const HostDirectory& host, const StateFile& state) {
+  const StateFile::Lock lock(state, LockMode::kShared);
+  auto files = RootIndex::Load(host);
+  if (!files) {
+    throw HostError(host.Path() + " has not been assembled; do it with \"secpolicy host assemble " +
+                    host.Path() + "\"");
+  }
+  return std::move(*files);
+}
+
+void RefreshUnderLock(StateKeeper& keeper, const StateFile& state) {
+  const StateFile::Lock lock(state, LockMode::kShared);
+  keeper.Refresh();
+}
+
+}  // namespace
+
+Session::Session(HostDirectory host, const SessionOptions& options)
+    : host_(std::move(host)),
+      module_(DescriptionOf(host_), processes_),
+      file_(host_),
+      keeper_(file_, host_.Ref().PathOf(kStateFile), module_),
+      trace_(options.trace),
+      observed_(module_, point_),
+      files_(FilesOf(host_, file_)),
+      attached_{observed_, point_, module_, files_} {
+  RefreshUnderLock(keeper_, file_);
+  for (const Fault& fault : options.faults) faults_.Add(fault);
+  // The lock is held around everything; a fault is traced as the refusal that it stands for.
+  point_.Add(keeper_);
+  point_.Add(trace_);
+  point_.Add(faults_);
+  const UniqueFd root = OpenDirectory(host_.Ref(), kRootDirectory);
+  ChangeRoot({root.Get(), host_.Ref().PathOf(kRootDirectory)}, options.visible);
+  EnterGate();
+  Attach(&attached_);
+}
+
+Session::~Session() { Attach(nullptr); }
+
+}  // namespace StandIn

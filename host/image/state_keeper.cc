@@ -1,0 +1,85 @@
+#include "host/image/state_keeper.h"
+
+#include <cerrno>
+#include <utility>
+
+#include "host/host_error.h"
+#include "host/module/module_error.h"
+
+namespace StandIn {
+
+StateKeeper::StateKeeper(StateFile& file, std::string path, SimulatedModule& module)
+    : file_(file), path_(std::move(path)), module_(module), initial_(module.Save()) {}
+
+void StateKeeper::Refresh() {
+  const StateFile::Version current = file_.CurrentVersion();
+  if (current == version_) return;
+  const auto text = file_.Read();
+  module_.Restore(text ? *text : initial_, path_);
+  version_ = current;
+}
+
+void StateKeeper::Around(const OperationCall& call, const Callable<void>& proceed) {
+  const Effect effect = InfoOf(call.operation).effect;
+  if (effect == Effect::kNone) return proceed();
+  if (batch_) {
+    changedInBatch_ |= effect == Effect::kChanges;
+    return proceed();
+  }
+  try {
+    const StateFile::Lock lock(
+        file_, effect == Effect::kChanges ? LockMode::kExclusive : LockMode::kShared);
+    Refresh();
+    Guarded(effect, proceed);
+  } catch (const HostError& failure) {
+    throw ModuleError(EIO, failure.what());
+  }
+}
+
+// A refused operation may have done part of its work, which is kept as well.
+void StateKeeper::Guarded(Effect effect, const Callable<void>& proceed) {
+  if (effect != Effect::kChanges) return proceed();
+  try {
+    proceed();
+  } catch (...) {
+    Write();
+    throw;
+  }
+  Write();
+}
+
+void StateKeeper::Write() {
+  try {
+    file_.Write(module_.Save());
+    version_ = file_.CurrentVersion();
+  } catch (...) {
+    // Back to what is kept.
+    version_.reset();
+    Refresh();
+    throw;
+  }
+}
+
+void StateKeeper::BeginBatch() {
+  batch_.emplace(file_, LockMode::kExclusive);
+  try {
+    Refresh();
+  } catch (...) {
+    batch_.reset();
+    throw;
+  }
+  changedInBatch_ = false;
+}
+
+void StateKeeper::Commit() {
+  if (!batch_) return;
+  try {
+    if (changedInBatch_) Write();
+  } catch (...) {
+    batch_.reset();
+    throw;
+  }
+  batch_.reset();
+}
+
+}  // namespace StandIn

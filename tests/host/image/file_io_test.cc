@@ -1,0 +1,153 @@
+#include "host/image/file_io.h"
+
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+
+#include "host/host_error.h"
+#include "tests/host/image/child_process.h"
+#include "tests/host/image/temporary_directory.h"
+
+namespace StandIn {
+namespace {
+
+using testing::ElementsAre;
+
+class FileIoTest : public testing::Test {
+ protected:
+  FileIoTest() { Open(); }
+
+  void Open() { fd_ = UniqueFd(::open(Path().c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC)); }
+  [[nodiscard]] std::string Path() const { return directory_.Path(); }
+  [[nodiscard]] std::string Path(const std::string& name) const { return directory_ / name; }
+  // Messages call the directory D.
+  [[nodiscard]] DirectoryRef Ref() const { return {fd_.Get(), "D"}; }
+  [[nodiscard]] std::string ReplaceError(const std::string& text) const {
+    return MessageOf<HostError>([&] { ReplaceFile(Ref(), "f", text); });
+  }
+
+  TemporaryDirectory directory_;
+  UniqueFd fd_;
+};
+
+TEST_F(FileIoTest, ReadsWholeFiles) {
+  const std::string bytes = std::string(200000, 'x') + '\0' + "end";
+  WriteBytes(Path("f"), bytes);
+  EXPECT_EQ(ReadFile(Ref(), "f"), bytes);
+  EXPECT_EQ(ReadFileIfThere(Ref(), "f"), bytes);
+}
+
+TEST_F(FileIoTest, AMissingFileIsNothingOrAnError) {
+  EXPECT_EQ(ReadFileIfThere(Ref(), "f"), std::nullopt);
+  EXPECT_EQ(MessageOf<HostError>([&] { ReadFile(Ref(), "f"); }),
+            "D/f: cannot be opened: No such file or directory");
+}
+
+TEST_F(FileIoTest, OnlyRegularFilesAreRead) {
+  ASSERT_EQ(::mkfifo(Path("fifo").c_str(), 0600), 0);
+  EXPECT_EQ(MessageOf<HostError>([&] { ReadFile(Ref(), "fifo"); }), "D/fifo: not a regular file");
+  ASSERT_EQ(::mkdir(Path("dir").c_str(), 0700), 0);
+  EXPECT_EQ(MessageOf<HostError>([&] { ReadFile(Ref(), "dir"); }), "D/dir: not a regular file");
+}
+
+TEST_F(FileIoTest, AnUnreadableFileIsNamed) {
+  WriteBytes(Path("f"), "secret");
+  std::filesystem::permissions(Path("f"), std::filesystem::perms::none);
+  GiveToOrdinaryUser(Path());
+  GiveToOrdinaryUser(Path("f"));
+  EXPECT_TRUE(PassesAsOrdinaryUser([&] {
+    EXPECT_EQ(MessageOf<HostError>([&] { ReadFile(Ref(), "f"); }),
+              "D/f: cannot be opened: Permission denied");
+  }));
+}
+
+TEST_F(FileIoTest, ReplacingMakesAFileOrANewOne) {
+  ReplaceFile(Ref(), "f", "one");
+  EXPECT_EQ(ReadBytes(Path("f")), "one");
+  struct stat first;
+  ASSERT_EQ(::stat(Path("f").c_str(), &first), 0);
+  const UniqueFd stillOpen(::open(Path("f").c_str(), O_RDONLY | O_CLOEXEC));
+
+  ReplaceFile(Ref(), "f", std::string(300000, '2'));
+  EXPECT_EQ(ReadBytes(Path("f")), std::string(300000, '2'));
+  struct stat second;
+  ASSERT_EQ(::stat(Path("f").c_str(), &second), 0);
+  EXPECT_NE(first.st_ino, second.st_ino);
+  EXPECT_THAT(NamesIn(Path()), ElementsAre("f"));
+}
+
+TEST_F(FileIoTest, WhatAKilledProcessLeftDoesntStandInTheWay) {
+  WriteBytes(Path("elsewhere"), "untouched");
+  ASSERT_EQ(::symlink("elsewhere", Path("f.new." + std::to_string(::getpid())).c_str()), 0);
+  ReplaceFile(Ref(), "f", "text");
+  EXPECT_EQ(ReadBytes(Path("f")), "text");
+  EXPECT_EQ(ReadBytes(Path("elsewhere")), "untouched");
+  EXPECT_THAT(NamesIn(Path()), testing::UnorderedElementsAre("f", "elsewhere"));
+}
+
+TEST_F(FileIoTest, AReadOnlyDirectoryKeepsTheOldFile) {
+  WriteBytes(Path("f"), "old");
+  std::filesystem::permissions(Path(), std::filesystem::perms(0555));
+  GiveToOrdinaryUser(Path());
+  GiveToOrdinaryUser(Path("f"));
+  EXPECT_TRUE(PassesAsOrdinaryUser([&] {
+    EXPECT_EQ(ReplaceError("new"), "D/f: cannot be written: Permission denied");
+    EXPECT_EQ(ReadBytes(Path("f")), "old");
+    EXPECT_THAT(NamesIn(Path()), ElementsAre("f"));
+  }));
+  std::filesystem::permissions(Path(), std::filesystem::perms(0755));
+}
+
+TEST_F(FileIoTest, AFullDiskKeepsTheOldFile) {
+  const ChildResult result = RunOnSmallFileSystem(Path(), 65536, [&] {
+    Open();
+    ReplaceFile(Ref(), "f", "old");
+    EXPECT_EQ(ReplaceError(std::string(200000, 'x')),
+              "D/f: cannot be written: No space left on device");
+    EXPECT_EQ(ReadBytes(Path("f")), "old");
+    EXPECT_THAT(NamesIn(Path()), ElementsAre("f"));
+    ReplaceFile(Ref(), "f", std::string(30000, 'y'));
+    EXPECT_EQ(ReadBytes(Path("f")), std::string(30000, 'y'));
+  });
+  if (result == ChildResult::kNotPermitted) {
+    GTEST_SKIP() << "this user may not mount a small file system";
+  }
+  EXPECT_EQ(result, ChildResult::kPassed);
+}
+
+TEST_F(FileIoTest, AVanishedDirectoryIsNamed) {
+  std::filesystem::remove_all(Path());
+  EXPECT_EQ(ReplaceError("new"), "D/f: cannot be written: No such file or directory");
+}
+
+TEST_F(FileIoTest, ADirectoryIsntReplaced) {
+  ASSERT_EQ(::mkdir(Path("f").c_str(), 0700), 0);
+  EXPECT_EQ(ReplaceError("new"), "D/f: cannot be written: Is a directory");
+  EXPECT_THAT(NamesIn(Path()), ElementsAre("f"));
+}
+
+TEST(UniqueFdTest, ClosesWhatItOwnsOnce) {
+  UniqueFd first(::open("/dev/null", O_RDONLY | O_CLOEXEC));
+  const int number = first.Get();
+  ASSERT_TRUE(first.IsOpen());
+  UniqueFd second(std::move(first));
+  EXPECT_FALSE(first.IsOpen());  // NOLINT: what a move leaves is part of the contract
+  EXPECT_EQ(second.Get(), number);
+  EXPECT_EQ(::fcntl(number, F_GETFD), FD_CLOEXEC);
+  second = UniqueFd();
+  EXPECT_EQ(::fcntl(number, F_GETFD), -1);
+}
+
+TEST(UniqueFdTest, GivesItsDescriptorAway) {
+  int number = -1;
+  {
+    UniqueFd owner(::open("/dev/null", O_RDONLY | O_CLOEXEC));
+    number = owner.Release();
+  }
+  EXPECT_EQ(::fcntl(number, F_GETFD), FD_CLOEXEC);
+  const UniqueFd closer(number);
+}
+
+}  // namespace
+}  // namespace StandIn
