@@ -1,0 +1,92 @@
+#include "tools/secpolicy/child_process.h"
+
+#include <fcntl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <cstdlib>
+#include <exception>
+#include <string_view>
+#include <system_error>
+
+#include "host/image/unique_fd.h"
+#include "tools/secpolicy/output.h"
+#include "tools/secpolicy/verbs.h"
+
+namespace SecPolicyTool {
+
+using StandIn::UniqueFd;
+
+namespace {
+
+[[noreturn]] void ThrowSystemError(const char* call) {
+  throw std::system_error(errno, std::generic_category(), call);
+}
+
+[[noreturn]] void BeChild(const std::function<int()>& work, UniqueFd errors) {
+  int status = kFailed;
+  try {
+    if (dup2(errors.Get(), STDERR_FILENO) < 0) ThrowSystemError("dup2");
+    errors.Reset();
+    status = work();
+    FlushOutput();
+  } catch (const std::exception& failure) {
+    ReportError(failure.what());
+    status = kFailed;
+  }
+  std::exit(status);
+}
+
+// Hands over the complete lines of `text` and leaves the rest in it.
+void TakeLines(std::string& text, const std::function<void(std::string&)>& line) {
+  std::size_t start = 0;
+  for (std::size_t end; (end = text.find('\n', start)) != std::string::npos; start = end + 1) {
+    std::string whole = text.substr(start, end - start);
+    line(whole);
+  }
+  text.erase(0, start);
+}
+
+void ReadLines(int fd, const std::function<void(std::string&)>& line) {
+  std::string text;
+  std::array<char, 4096> buffer;
+  for (;;) {
+    const ssize_t size = read(fd, buffer.data(), buffer.size());
+    if (size < 0 && errno == EINTR) continue;
+    if (size <= 0) break;
+    text.append(buffer.data(), static_cast<std::size_t>(size));
+    TakeLines(text, line);
+  }
+  if (!text.empty()) line(text);
+}
+
+int WaitFor(pid_t child) {
+  int status = 0;
+  while (waitpid(child, &status, 0) < 0) {
+    if (errno != EINTR) ThrowSystemError("waitpid");
+  }
+  return status;
+}
+
+}  // namespace
+
+int RunInChild(const std::function<int()>& work,
+               const std::function<void(std::string& line)>& line) {
+  int ends[2];
+  if (pipe2(ends, O_CLOEXEC) != 0) ThrowSystemError("pipe2");
+  UniqueFd readEnd(ends[0]);
+  UniqueFd writeEnd(ends[1]);
+  const pid_t child = fork();
+  if (child < 0) ThrowSystemError("fork");
+  if (child == 0) {
+    readEnd.Reset();
+    BeChild(work, std::move(writeEnd));
+  }
+  writeEnd.Reset();
+  ReadLines(readEnd.Get(), line);
+  return WaitFor(child);
+}
+
+}  // namespace SecPolicyTool

@@ -1,0 +1,83 @@
+// secpolicy host info DIR
+#include <iostream>
+#include <memory>
+
+#include "host/image/host_directory.h"
+#include "host/image/proc_processes.h"
+#include "host/image/root_index.h"
+#include "host/image/state_keeper.h"
+#include "host/module/description_json.h"
+#include "host/module/simulated_module.h"
+#include "tools/secpolicy/verbs.h"
+
+namespace SecPolicyTool {
+
+using namespace StandIn;
+
+namespace {
+
+void PrintImage(const HostDirectory& host) {
+  const auto text = ReadFileIfThere(host.Ref(), kIndexFile);
+  if (!text) {
+    std::cout << "Image: not assembled\n";
+    return;
+  }
+  const ImageIndex index = ParseImageIndex(*text, host.Ref().PathOf(kIndexFile));
+  std::cout << "Image: " << index.tardisks.size() << " tardisks\n";
+  for (const TardiskContent& tardisk : index.tardisks) {
+    std::cout << "  " << tardisk.name << ": " << tardisk.paths.size() << " paths\n";
+  }
+}
+
+// The number of the domain's rules of each type that it has any of.
+void PrintDomain(SimulatedModule& module, DomainId domain) {
+  const auto info = module.GetDomainInfo(domain);
+  if (!info) return;
+  std::cout << "  " << domain << " " << info->name << ":";
+  std::size_t rules = 0;
+  const auto print = [&](const std::string& keyword, std::size_t count) {
+    if (count != 0) std::cout << " " << keyword << " " << count;
+    rules += count;
+  };
+  for (std::size_t kind = 0; kind < kRuleKinds; ++kind) {
+    const auto ruleKind = static_cast<RuleKind>(kind);
+    print(InfoOf(ruleKind).keyword, module.Rules(ruleKind, domain).size());
+  }
+  print("-r", module.CountFileRules(domain));
+  std::cout << (rules == 0 ? " no rules\n" : "\n");
+}
+
+void PrintKernel(const HostDirectory& host, const ModuleDescription& description) {
+  const ProcProcesses processes;
+  SimulatedModule module(description, processes);
+  StateFile file(host);
+  StateKeeper keeper(file, host.Ref().PathOf(kStateFile), module);
+  {
+    const StateFile::Lock lock(file, LockMode::kShared);
+    keeper.Refresh();
+  }
+  std::cout << "Objects: " << module.Words(WordList::kObjects).size() << "\nDomains:\n";
+  for (DomainId domain = 0; domain < module.MaxDomains(); ++domain) PrintDomain(module, domain);
+}
+
+void PrintInfo(const HostDirectory& host) {
+  const ModuleDescription description =
+      ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile));
+  std::cout << "Host: " << host.Path() << "\nLimits: " << description.limits.domains << " domains, "
+            << description.limits.labels << " labels of each type, "
+            << description.limits.fileRulesPerDomain << " file rules a domain\n";
+  PrintImage(host);
+  PrintKernel(host, description);
+}
+
+}  // namespace
+
+void AddHostInfo(CLI::App& app, ExitStatus&) {
+  CLI::App* verb =
+      app.add_subcommand("info", "Say what a host is made of and what its kernel holds");
+  const auto dir = std::make_shared<std::string>();
+  verb->add_option("DIR", *dir, "The host directory")->required();
+  verb->callback([dir] { PrintInfo(HostDirectory(*dir)); });
+}
+
+}  // namespace SecPolicyTool

@@ -1,0 +1,124 @@
+// secpolicy load [--host DIR] [--trace] [--fail OPERATION[:N]] [POLICYDIR]
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstring>
+#include <exception>
+#include <iostream>
+#include <memory>
+#include <stdexcept>
+
+#include "host/image/session.h"
+#include "secpolicy/secpolicy.h"
+#include "tools/secpolicy/child_process.h"
+#include "tools/secpolicy/host_option.h"
+#include "tools/secpolicy/output.h"
+#include "tools/secpolicy/policy_path.h"
+#include "tools/secpolicy/progress_filter.h"
+#include "tools/secpolicy/verbs.h"
+
+namespace SecPolicyTool {
+
+namespace {
+
+struct LoadArguments {
+  std::string host;
+  std::string policy;
+  bool trace = false;
+  std::vector<StandIn::Fault> faults;
+};
+
+// What the terminate handler needs, which is not handed anything.
+struct Loading {
+  StandIn::Session& session;
+  std::string stateFile;
+};
+const Loading* loading = nullptr;
+
+// A kernel keeps what was installed before the process ended, and so does this one.
+[[noreturn]] void OnTerminate() {
+  try {
+    loading->session.Commit();
+    ReportError("the load was terminated before its end; what it had installed until then is in " +
+                loading->stateFile);
+  } catch (const std::exception& failure) {
+    ReportError(std::string("the load was terminated, and what it had installed is lost: ") +
+                failure.what());
+  }
+  _exit(kTerminated);
+}
+
+StandIn::SessionOptions OptionsOf(const LoadArguments& arguments, const PolicyPath& policy) {
+  StandIn::SessionOptions options{
+      .visible = policy.visible, .trace = nullptr, .faults = arguments.faults};
+  if (arguments.trace) {
+    options.trace = [](const std::string& line) { std::cerr << "kernel: " + line + "\n"; };
+  }
+  return options;
+}
+
+// LoadPolicy in the host, kept as a whole. Runs in the child.
+int LoadIn(StandIn::HostDirectory host, const LoadArguments& arguments) {
+  const PolicyPath policy = LocatePolicy(arguments.policy);
+  OpenProgressLog();
+  const std::string stateFile = host.Ref().PathOf(StandIn::kStateFile);
+  StandIn::Session session(std::move(host), OptionsOf(arguments, policy));
+  session.BeginBatch();
+  const Loading current{session, stateFile};
+  loading = &current;
+  std::set_terminate(OnTerminate);
+  int status = kDone;
+  try {
+    SecPolicy::LoadPolicy(policy.path);
+  } catch (const std::exception& failure) {
+    ReportError(failure.what());
+    status = kFailed;
+  }
+  session.Commit();
+  return status;
+}
+
+ExitStatus Load(const LoadArguments& arguments) {
+  StandIn::HostDirectory host = OpenHost(arguments.host);
+  const int status = RunInChild([&] { return LoadIn(std::move(host), arguments); },
+                                [](std::string& line) {
+                                  if (FilterProgress(line)) std::cerr << line + "\n";
+                                });
+  if (WIFSIGNALED(status)) {
+    ReportError(std::string("the load was killed (") + strsignal(WTERMSIG(status)) +
+                "); the kernel holds what it held before");
+    return kFailed;
+  }
+  return static_cast<ExitStatus>(WEXITSTATUS(status));
+}
+
+// For CLI11: the text of what is wrong with a fault, or nothing.
+std::string FaultProblem(const std::string& text) try {
+  StandIn::ParseFault(text);
+  return {};
+} catch (const std::invalid_argument& problem) {
+  return problem.what();
+}
+
+}  // namespace
+
+void AddLoad(CLI::App& app, ExitStatus& status) {
+  CLI::App* verb = app.add_subcommand("load", "Load a policy into a host's kernel");
+  const auto arguments = std::make_shared<LoadArguments>();
+  const auto faults = std::make_shared<std::vector<std::string>>();
+  AddHostOption(*verb, arguments->host);
+  verb->add_flag("--trace", arguments->trace, "Show every kernel operation");
+  verb->add_option("--fail", *faults, "Have the kernel refuse the N-th call (1) of an operation")
+      ->type_name("OPERATION[:N]")
+      ->check(FaultProblem);
+  verb->add_option("POLICYDIR", arguments->policy,
+                   "The policy directory; without it, the host's own /etc/olvane/secpolicy");
+  verb->callback([arguments, faults, &status] {
+    for (const std::string& fault : *faults) {
+      arguments->faults.push_back(StandIn::ParseFault(fault));
+    }
+    status = Load(*arguments);
+  });
+}
+
+}  // namespace SecPolicyTool

@@ -1,0 +1,31 @@
+#include "tools/secpolicy/policy_path.h"
+
+#include <filesystem>
+
+namespace SecPolicyTool {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+// Without "." and "..", and without a slash at its end. A link stays a link: messages are to name
+// the files as their author does.
+fs::path AbsolutePath(const std::string& dir) {
+  const fs::path given = fs::absolute(dir);
+  fs::path path = given.lexically_normal();
+  if (!path.has_filename()) path = path.parent_path();
+  // Behind a link, ".." leads elsewhere than the text says.
+  std::error_code ignored;
+  return fs::exists(given) && !fs::equivalent(given, path, ignored) ? fs::canonical(given) : path;
+}
+
+}  // namespace
+
+PolicyPath LocatePolicy(const std::string& dir) {
+  if (dir.empty()) return {"/etc/olvane/secpolicy", {}};
+  const std::string path = AbsolutePath(dir).string();
+  if (fs::is_directory(path)) return {path, {path}};
+  return {path, {}};
+}
+
+}  // namespace SecPolicyTool

@@ -1,0 +1,19 @@
+// The policy directory of a load, as the host is to see it.
+#pragma once
+
+#include <string>
+#include <vector>
+
+namespace SecPolicyTool {
+
+struct PolicyPath {
+  std::string path;                  // absolute
+  std::vector<std::string> visible;  // what has to be made visible in the host for it
+};
+
+// Where `dir`, as given on the command line, is: a directory outside the host, which is to be seen
+// inside under the same absolute path, or else one that only the host may have. Empty for the
+// host's own "/etc/olvane/secpolicy".
+PolicyPath LocatePolicy(const std::string& dir);
+
+}  // namespace SecPolicyTool
