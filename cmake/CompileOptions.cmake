@@ -1,0 +1,31 @@
+# Options that every target of the project is compiled with, as the interface target
+# secpolicy_options.
+
+find_program(CCACHE_PROGRAM ccache)
+if(CCACHE_PROGRAM)
+  set(CMAKE_CXX_COMPILER_LAUNCHER ${CCACHE_PROGRAM})
+endif()
+
+add_library(secpolicy_options INTERFACE)
+target_compile_options(secpolicy_options INTERFACE
+  -Wall -Wextra -Wpedantic -Wshadow -Wconversion -Wnon-virtual-dtor -Woverloaded-virtual)
+
+if(SECPOLICY_WERROR)
+  target_compile_options(secpolicy_options INTERFACE -Werror)
+endif()
+
+if(SECPOLICY_SANITIZE)
+  # A finding ends the test that made it instead of being a line that nobody reads.
+  target_compile_options(secpolicy_options INTERFACE
+    -fsanitize=${SECPOLICY_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  target_link_options(secpolicy_options INTERFACE -fsanitize=${SECPOLICY_SANITIZE})
+endif()
+
+if(SECPOLICY_COVERAGE)
+  target_compile_options(secpolicy_options INTERFACE --coverage)
+  target_link_options(secpolicy_options INTERFACE --coverage)
+endif()
+
+if(SECPOLICY_FUZZ)
+  target_compile_options(secpolicy_options INTERFACE -fsanitize=fuzzer-no-link)
+endif()

@@ -1,0 +1,48 @@
+#include "tests/support/system_log.h"
+
+#include <syslog.h>
+#include <unistd.h>
+
+#include <cstdarg>
+#include <cstdio>
+#include <string>
+
+namespace {
+
+int capturedTo = -1;
+
+std::string PriorityWord(int priority) {
+  switch (priority) {
+    case LOG_INFO:
+      return "info";
+    case LOG_ERR:
+      return "error";
+    default:
+      return std::to_string(priority);
+  }
+}
+
+}  // namespace
+
+namespace SecPolicyTest {
+
+void CaptureSystemLog(int fd) { capturedTo = fd; }
+
+}  // namespace SecPolicyTest
+
+// Stands before the C library's function of this name, so that the library under test needs no
+// seam for its logging and the format and priority that it really uses are seen.
+extern "C" void syslog(int priority, const char* format, ...) {
+  va_list arguments;
+  va_start(arguments, format);
+  if (capturedTo < 0) {
+    vsyslog(priority, format, arguments);
+  } else {
+    char* text = nullptr;
+    if (vasprintf(&text, format, arguments) >= 0) {
+      dprintf(capturedTo, "%s: %s\n", PriorityWord(priority).c_str(), text);
+      free(text);
+    }
+  }
+  va_end(arguments);
+}
