@@ -6,7 +6,6 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
-#include <cstring>
 #include <vector>
 
 namespace StandIn {
@@ -51,9 +50,9 @@ std::string ReadString(std::uint64_t address, std::size_t room) {
     const std::size_t toPageEnd = kPage - (address + text.size()) % kPage;
     const std::size_t size = std::min(toPageEnd, room - text.size());
     ReadMemory(address + text.size(), chunk.data(), size);
-    const char* end = static_cast<const char*>(std::memchr(chunk.data(), '\0', size));
-    if (end != nullptr) return text.append(static_cast<const char*>(chunk.data()), end);
-    text.append(chunk.data(), size);
+    const char* end = std::find(chunk.data(), chunk.data() + size, '\0');
+    text.append(static_cast<const char*>(chunk.data()), end);
+    if (end != chunk.data() + size) return text;
   }
   throw BadArgument{ENAMETOOLONG};
 }

@@ -2,7 +2,7 @@
 
 #include <archive.h>
 #include <archive_entry.h>
-#include <locale.h>
+#include <locale.h>  // NOLINT(modernize-deprecated-headers): newlocale is POSIX, not C++
 #include <sys/stat.h>
 
 #include <cerrno>

@@ -16,7 +16,7 @@ bool SeparatesWords(char c) {
 
 std::string Checked(const JsonCursor& place,
                     std::optional<NameFault> (*faultOf)(const std::string&)) {
-  const std::string name = DecodeBytes(place);
+  std::string name = DecodeBytes(place);
   if (const std::optional<NameFault> fault = faultOf(name)) {
     place.Fail(fault->text);
   }
@@ -32,7 +32,7 @@ std::string ReadPath(const JsonCursor& place) { return Checked(place, FaultOfPat
 std::string ReadNonEmpty(const JsonCursor& place) { return Checked(place, FaultOfFreeWord); }
 
 std::string ReadWord(const JsonCursor& place) {
-  const std::string word = DecodeBytes(place);
+  std::string word = DecodeBytes(place);
   if (word.empty()) {
     place.Fail("is empty");
   }

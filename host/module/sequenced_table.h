@@ -15,8 +15,8 @@ class SequencedTable {
   using Key = typename Index::key_type;
 
   SequencedTable() = default;
-  SequencedTable(SequencedTable&&) = default;
-  SequencedTable& operator=(SequencedTable&&) = default;
+  SequencedTable(SequencedTable&&) noexcept = default;
+  SequencedTable& operator=(SequencedTable&&) noexcept = default;
 
   [[nodiscard]] std::size_t Size() const { return records_.size(); }
   [[nodiscard]] const std::list<Record>& Records() const { return records_; }

@@ -81,14 +81,11 @@ std::optional<DomainInfo> ObservedModule::GetDomainInfo(DomainId domain) {
 }
 
 std::uint32_t ObservedModule::MaxDomains() {
-  return point_.Pass(
-      Operation::kMaxDomains, kNoWords, [&] { return module_.MaxDomains(); });
+  return point_.Pass(Operation::kMaxDomains, kNoWords, [&] { return module_.MaxDomains(); });
 }
 
 std::vector<DomainId> ObservedModule::LeakedDomains() {
-  return point_.Pass(
-      Operation::kLeakedDomains, kNoWords,
-      [&] { return module_.LeakedDomains(); });
+  return point_.Pass(Operation::kLeakedDomains, kNoWords, [&] { return module_.LeakedDomains(); });
 }
 
 void ObservedModule::SetDomainRole(DomainRole role, DomainId domain) {
@@ -244,8 +241,7 @@ LabelId ObservedModule::FileLabel(const std::string& path) {
 }
 
 std::string ObservedModule::Tardisk(TardiskWord word) {
-  return point_.Pass(
-      TardiskOperation(word), kNoWords, [&] { return module_.Tardisk(word); });
+  return point_.Pass(TardiskOperation(word), kNoWords, [&] { return module_.Tardisk(word); });
 }
 
 }  // namespace StandIn

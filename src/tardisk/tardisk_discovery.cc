@@ -41,7 +41,7 @@ void SortPolicyFile(const std::string& path, std::list<TardiskPolicy*>& withPoli
     SecpolicyError("Ignoring " + path);
   } else {
     withPolicy.push_back(policy.get());
-    policy.release();  // the list owns it now
+    static_cast<void>(policy.release());  // the list owns it now
     remaining.remove(tardisk);
   }
 }

@@ -24,7 +24,7 @@ fs::path PathVariable(const char* name) {
 }
 
 fs::path StateDirectory() {
-  if (const fs::path state = PathVariable("XDG_STATE_HOME"); !state.empty()) return state;
+  if (fs::path state = PathVariable("XDG_STATE_HOME"); !state.empty()) return state;
   const fs::path home = PathVariable("HOME");
   if (home.empty()) {
     throw HostError(
