@@ -18,7 +18,6 @@ void ForEachRuleLine(const std::string& file, const std::string& subject, const 
   std::map<unsigned int, std::queue<std::string>> lines;
   ParseFile(file, lines);
   for (auto& [line, words] : lines) {
-    if (words.empty()) continue;
     const std::string type = words.front();
     words.pop();
     const auto ruleSet = ruleSets.find(type);
