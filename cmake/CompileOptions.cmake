@@ -10,6 +10,11 @@ add_library(secpolicy_options INTERFACE)
 target_compile_options(secpolicy_options INTERFACE
   -Wall -Wextra -Wpedantic -Wshadow -Wconversion -Wnon-virtual-dtor -Woverloaded-virtual)
 
+if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
+  # Optimising, GCC 12 takes `"literal" + std::string()` for overlapping memory.
+  target_compile_options(secpolicy_options INTERFACE -Wno-restrict)
+endif()
+
 if(SECPOLICY_WERROR)
   target_compile_options(secpolicy_options INTERFACE -Werror)
 endif()
