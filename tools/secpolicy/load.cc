@@ -110,6 +110,7 @@ void AddLoad(CLI::App& app, ExitStatus& status) {
   verb->add_flag("--trace", arguments->trace, "Show every kernel operation");
   verb->add_option("--fail", *faults, "Have the kernel refuse the N-th call (1) of an operation")
       ->type_name("OPERATION[:N]")
+      ->allow_extra_args(false)  // what follows is the policy directory
       ->check(FaultProblem);
   verb->add_option("POLICYDIR", arguments->policy,
                    "The policy directory; without it, the host's own /etc/olvane/secpolicy");

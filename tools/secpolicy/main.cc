@@ -31,7 +31,7 @@ ExitStatus Run(int argc, char** argv) {
     app.parse(argc, argv);
   } catch (const CLI::ParseError& outcome) {
     // Help and version arrive as errors too; those have exit code 0.
-    return app.exit(outcome) == 0 ? kDone : kUsage;
+    if (app.exit(outcome) != 0) return kUsage;
   }
   FlushOutput();
   return status;
