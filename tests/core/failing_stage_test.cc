@@ -72,13 +72,12 @@ TEST_F(FailingStageTest, BadDomainLineKeepsTheLinesBeforeIt) {
 
 TEST_F(FailingStageTest, ContradictoryDomain) {
   Fail(Operation::kCheckCapabilityParams);
-  ExpectLoadReports(
-      {"Policy constraint error for domain: appDom : refused on request: check-capability-params, "
-       "call 1",
-       "Error in policy constraints check for some domains",
-       "Skipping the policy for domain appDom due to errors in the policy",
-       "Error in setting the policy for some domains", "Failure in domain policy"},
-      AllBut({kDomainsSet}));
+  const std::string refusal = "refused on request: check-capability-params, call 1";
+  ExpectLoadReports({"Policy constraint error for domain: appDom : " + refusal,
+                     "Error in policy constraints check for some domains",
+                     "Skipping the policy for domain appDom due to errors in the policy",
+                     "Error in setting the policy for some domains", "Failure in domain policy"},
+                    AllBut({kDomainsSet}));
 }
 
 TEST_F(FailingStageTest, RefusedRule) {

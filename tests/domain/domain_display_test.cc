@@ -5,7 +5,6 @@ namespace SecPolicyTest {
 namespace {
 
 using testing::ElementsAre;
-using testing::IsEmpty;
 
 constexpr char kBanner[] =
     "\n\n------------------------\nPolicy set in the kernel\n\n------------------------\n";

@@ -10,7 +10,6 @@
 namespace SecPolicyTest {
 namespace {
 
-using ZekCtl::Kernel::PrivateCall;
 
 class PathRecordTest : public DomainTest {
  protected:

@@ -9,7 +9,6 @@ namespace {
 using namespace ZekCtl::Security;
 using testing::ElementsAre;
 using testing::IsEmpty;
-using testing::Pair;
 
 class ZekAccessTest : public AccessTest {
  protected:

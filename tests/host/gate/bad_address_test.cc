@@ -10,7 +10,6 @@ namespace {
 
 using SecPolicy::ZekAccess_FileRule;
 using SecPolicyTest::Outcome;
-using testing::ElementsAre;
 using testing::IsEmpty;
 
 constexpr unsigned int kDomain = 1;
