@@ -10,7 +10,6 @@
 namespace SecPolicyTest {
 namespace {
 
-
 class PathRecordTest : public DomainTest {
  protected:
   // Sets the rule "PATH rx" of the domain 7 under a kernel that resolves as `resolve` does, and
