@@ -4,6 +4,7 @@
 #include <sys/syscall.h>
 #include <sys/xattr.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
@@ -62,15 +63,29 @@ bool NamesLabel(std::uint64_t name) {
   }
 }
 
-// The path within the image of the file that the caller names; nothing for a file outside.
-std::optional<std::string> ImagePath(const AttachedHost& host, std::uint64_t address) {
+// Whether `path`, which holds no links, is one of the directories made visible, or below one.
+bool IsMadeVisible(const AttachedHost& host, const std::string& path) {
+  return std::any_of(host.visible.begin(), host.visible.end(), [&](const std::string& dir) {
+    return path == dir || path.starts_with(dir + "/");
+  });
+}
+
+// The path under which the label of the file that the caller names is kept; nothing for a file that
+// carries none. Beside the files of the image, what is made visible carries one, since on a machine
+// of its own it would lie in the same file system; and so do directories that no archive brought,
+// since the host itself makes such for what is to be visible.
+std::optional<std::string> LabelledPath(const AttachedHost& host, std::uint64_t address) {
   const std::string path = ReadString(address, PATH_MAX);
   struct stat status {};
   if (stat(path.c_str(), &status) != 0) throw BadArgument{errno};
-  return host.files.PathOf(status.st_dev, status.st_ino);
+  auto inImage = host.files.PathOf(status.st_dev, status.st_ino);
+  if (inImage) return inImage;
+  std::string resolved = RealPath(path);
+  if (S_ISDIR(status.st_mode) || IsMadeVisible(host, resolved)) return resolved;
+  return std::nullopt;
 }
 
-// Every file of the image carries the label from the start, every other file never.
+// A file that carries the label does so from the start, every other file never.
 void CheckFlags(std::uint64_t flags, bool carriesLabel) {
   if ((flags & ~static_cast<std::uint64_t>(XATTR_CREATE | XATTR_REPLACE)) != 0 ||
       flags == (XATTR_CREATE | XATTR_REPLACE)) {
@@ -84,7 +99,7 @@ void CheckFlags(std::uint64_t flags, bool carriesLabel) {
 
 long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments) noexcept {
   return AsResult([&]() -> long {
-    const std::string path = ReadString(arguments[1], ZekCtl::Kernel::kPathBytes);
+    std::string path = ReadString(arguments[1], ZekCtl::Kernel::kPathBytes);
     const std::string resolved = host.point.Pass(
         Operation::kResolvePath, [&] { return path; }, [&] { return RealPath(path); });
     WriteMemory(arguments[2], resolved.c_str(), resolved.size() + 1);
@@ -96,12 +111,12 @@ long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments
   const auto& [path, name, value, size, flags, unused] = arguments;
   if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_setxattr, arguments.data());
   return AsResult([&, value = value, size = size, flags = flags, path = path]() -> long {
-    const auto imagePath = ImagePath(host, path);
-    CheckFlags(flags, imagePath.has_value());
+    const auto labelledPath = LabelledPath(host, path);
+    CheckFlags(flags, labelledPath.has_value());
     LabelId label = 0;
     if (size != sizeof label) throw BadArgument{EINVAL};
     ReadMemory(value, &label, sizeof label);
-    host.module.SetFileLabel(*imagePath, label);
+    host.module.SetFileLabel(*labelledPath, label);
     return 0;
   });
 }
@@ -110,9 +125,9 @@ long AnswerGetAttribute(const AttachedHost& host, const CallArguments& arguments
   const auto& [path, name, value, size, unused1, unused2] = arguments;
   if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
   return AsResult([&, value = value, size = size, path = path]() -> long {
-    const auto imagePath = ImagePath(host, path);
-    if (!imagePath) throw BadArgument{ENODATA};
-    const LabelId label = host.module.FileLabel(*imagePath);
+    const auto labelledPath = LabelledPath(host, path);
+    if (!labelledPath) throw BadArgument{ENODATA};
+    const LabelId label = host.module.FileLabel(*labelledPath);
     if (size == 0) return sizeof label;
     if (size < sizeof label) throw BadArgument{ERANGE};
     WriteMemory(value, &label, sizeof label);

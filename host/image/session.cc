@@ -1,5 +1,6 @@
 #include "host/image/session.h"
 
+#include <filesystem>
 #include <utility>
 
 #include "host/gate/gate.h"
@@ -49,6 +50,9 @@ Session::Session(HostDirectory host, const SessionOptions& options)
   point_.Add(faults_);
   const UniqueFd root = OpenDirectory(host_.Ref(), kRootDirectory);
   ChangeRoot({root.Get(), host_.Ref().PathOf(kRootDirectory)}, options.visible);
+  for (const std::string& path : options.visible) {
+    attached_.visible.push_back(std::filesystem::canonical(path).string());
+  }
   EnterGate();
   Attach(&attached_);
 }

@@ -1,5 +1,7 @@
 // setxattr and getxattr of the attribute that holds a file's label.
+#include <sys/syscall.h>
 #include <sys/xattr.h>
+#include <unistd.h>
 
 #include <filesystem>
 
@@ -121,23 +123,36 @@ TEST_F(LabelAttributeTest, SizeCanBeAskedForAndMustFit) {
   });
 }
 
-TEST_F(LabelAttributeTest, FileOutsideTheImageCarriesNone) {
-  Policy("objects/base", "default\n");
+TEST_F(LabelAttributeTest, FileThatNoArchiveBroughtCarriesNone) {
   Assemble();
   WriteBytes(InRoot("/etc/new"), "not from an archive");
-  const std::string outside = PolicyPath("objects/base");
   const Outcome outcome = Run([&] {
-    std::vector<std::string> answers;
-    for (const char* path : {outside.c_str(), "/etc/new"}) {
-      answers.push_back(InTurn({Get(path), Set(path, kTardisk), Set(path, kTardisk, 0),
-                                Set(path, kTardisk, XATTR_CREATE)}));
-    }
-    return InTurn(answers);
+    const char* path = "/etc/new";
+    return InTurn({Get(path), Set(path, kTardisk), Set(path, kTardisk, 0),
+                   Set(path, kTardisk, XATTR_CREATE)});
   });
-  EXPECT_EQ(outcome.value,
-            "ENODATA, ENODATA, EOPNOTSUPP, EOPNOTSUPP, "
-            "ENODATA, ENODATA, EOPNOTSUPP, EOPNOTSUPP");
+  EXPECT_EQ(outcome.value, "ENODATA, ENODATA, EOPNOTSUPP, EOPNOTSUPP");
   EXPECT_THAT(outcome.Operations(), IsEmpty());
+}
+
+// Otherwise a label on a tree would fail only because the policy that is being tried lies in it.
+TEST_F(LabelAttributeTest, WhatIsMadeVisibleCarriesTheLabel) {
+  Policy("objects/base", "default\n");
+  const std::string file = PolicyPath("objects/base");
+  const Outcome outcome = Run([&] {
+    return InTurn({Get(file.c_str()), Set(file.c_str(), kTardisk), Get(file.c_str()),
+                   Set(PolicyDir().c_str(), kTardisk)});
+  });
+  EXPECT_EQ(outcome.value, "1, 0, 2, 0");
+}
+
+TEST_F(LabelAttributeTest, DirectoryThatNoArchiveBroughtCarriesTheLabel) {
+  Assemble();
+  std::filesystem::create_directories(InRoot("/srv/mount-point"));
+  const Outcome outcome = Run([] {
+    return InTurn({Get("/srv/mount-point"), Set("/srv/mount-point", kTardisk)});
+  });
+  EXPECT_EQ(outcome.value, "1, 0");
 }
 
 TEST_F(LabelAttributeTest, PathThatLeadsNowhereIsAnError) {
@@ -153,11 +168,12 @@ TEST_F(LabelAttributeTest, PathThatLeadsNowhereIsAnError) {
 TEST_F(LabelAttributeTest, BadAddressesAreErrorsAndTheLabelStays) {
   InHost([] {
     LastPage page;
+    // Made directly: a sanitizer would read the arguments before the C library's function does.
     const auto set = [](const char* path, const void* value) {
-      return ResultText(setxattr(path, kLabel, value, 4, XATTR_REPLACE));
+      return ResultText(syscall(SYS_setxattr, path, kLabel, value, 4UL, XATTR_REPLACE));
     };
     const auto get = [](const char* path, void* value) {
-      return ResultText(getxattr(path, kLabel, value, 4));
+      return ResultText(syscall(SYS_getxattr, path, kLabel, value, 4UL));
     };
     char* cell = page.PutAtEnd(std::string("\2\0\0\0", 4));
     EXPECT_EQ(set(nullptr, cell), "EFAULT");
