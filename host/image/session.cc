@@ -6,6 +6,7 @@
 #include "host/gate/gate.h"
 #include "host/host_error.h"
 #include "host/image/change_root.h"
+#include "host/image/system_failure.h"
 #include "host/module/description_json.h"
 
 namespace StandIn {
@@ -24,6 +25,13 @@ RootIndex FilesOf(const HostDirectory& host, const StateFile& state) {
                     host.Path() + "\"");
   }
   return std::move(*files);
+}
+
+std::string WithoutLinks(const std::string& path) {
+  std::error_code error;
+  std::string resolved = std::filesystem::canonical(path, error).string();
+  if (error) throw SystemFailure(path, "resolved in the host", error.value());
+  return resolved;
 }
 
 void RefreshUnderLock(StateKeeper& keeper, const StateFile& state) {
@@ -50,9 +58,7 @@ Session::Session(HostDirectory host, const SessionOptions& options)
   point_.Add(faults_);
   const UniqueFd root = OpenDirectory(host_.Ref(), kRootDirectory);
   ChangeRoot({root.Get(), host_.Ref().PathOf(kRootDirectory)}, options.visible);
-  for (const std::string& path : options.visible) {
-    attached_.visible.push_back(std::filesystem::canonical(path).string());
-  }
+  for (const std::string& path : options.visible) attached_.visible.push_back(WithoutLinks(path));
   EnterGate();
   Attach(&attached_);
 }

@@ -7,8 +7,6 @@
 namespace SecPolicyTest {
 namespace {
 
-using testing::IsEmpty;
-
 class RefusalTest : public HostTest {};
 
 TEST_F(RefusalTest, EachCallEndsItsMessageWithTheReason) {

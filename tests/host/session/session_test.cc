@@ -19,7 +19,6 @@ namespace {
 
 namespace fs = std::filesystem;
 using testing::ElementsAre;
-using testing::UnorderedElementsAre;
 using ZekCtl::Security::ZekAccessInterfaceImpl;
 
 class SessionViewTest : public SessionTest {

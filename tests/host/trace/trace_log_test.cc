@@ -9,7 +9,6 @@ namespace StandIn {
 namespace {
 
 using testing::ElementsAre;
-using testing::IsEmpty;
 
 // An operation and its line.
 struct Row {
