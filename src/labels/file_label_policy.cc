@@ -13,12 +13,12 @@ namespace {
 
 constexpr std::string_view kTreeSuffix = "/*";
 
-// Fills path and recursive from `specification`; false when "/*" stands anywhere but at its end.
-bool ReadSpecification(const std::string& specification, FileLabelPolicy::FileLabel& mapping) {
-  const std::size_t wildcard = specification.find(kTreeSuffix);
+// Fills path and recursive from `text`; false when "/*" stands anywhere but at its end.
+bool ReadPath(const std::string& text, FileLabelPolicy::FileLabel& mapping) {
+  const std::size_t wildcard = text.find(kTreeSuffix);
   mapping.recursive = wildcard != std::string::npos;
-  mapping.path = specification.substr(0, wildcard);
-  return !mapping.recursive || wildcard == specification.size() - kTreeSuffix.size();
+  mapping.path = text.substr(0, wildcard);
+  return !mapping.recursive || wildcard == text.size() - kTreeSuffix.size();
 }
 
 void Apply(const FileLabelPolicy::FileLabel& mapping, ZekAccessInterfaceImpl& iface) try {
@@ -40,7 +40,7 @@ void FileLabelPolicy::ParsePolicy(std::string path, ZekAccessInterfaceImpl& ifac
     if (words.size() != 2) throw TavonException(AtLine(path, line, "incorrect no of parameters"));
     FileLabel mapping{"", words.back(), false, path, line};
     iface.ValidateKeyword(ZekCtl::Security::kObjectKeyword, mapping.label);
-    if (!ReadSpecification(words.front(), mapping)) {
+    if (!ReadPath(words.front(), mapping)) {
       throw TavonException(AtLine(path, line, "Unrecognized format for file/dir specification"));
     }
     labels_.push_back(std::move(mapping));

@@ -46,7 +46,7 @@ class FileLabelPolicyTest : public LabelsTest {
 
 TEST_F(FileLabelPolicyTest, SpecificationNamesAPathOrATree) {
   struct Case {
-    std::string specification;
+    std::string path;
     std::vector<std::string> labelled;
   };
   const Case cases[] = {
@@ -56,20 +56,19 @@ TEST_F(FileLabelPolicyTest, SpecificationNamesAPathOrATree) {
       {"/opt/star*", {"/opt/star*"}},  // a star is a wildcard behind a slash only
   };
   for (const Case& row : cases) {
-    const Outcome outcome = ParseAndSet(row.specification + " web\n");
-    EXPECT_EQ(outcome.error, "") << row.specification;
+    const Outcome outcome = ParseAndSet(row.path + " web\n");
+    EXPECT_EQ(outcome.error, "") << row.path;
     EXPECT_THAT(outcome.Operations({"lookup-label", "set-file-label"}),
                 ElementsAreArray(Labelling(row.labelled, "web")))
-        << row.specification;
+        << row.path;
   }
 }
 
 TEST_F(FileLabelPolicyTest, WildcardAnywhereButAtTheEndIsRefused) {
-  for (const std::string specification :
+  for (const std::string path :
        {"/opt/*/y", "/*/y", "/*y", "/opt/*y", "/opt/*/", "/opt/**", "/opt/*/*", "/*/*", "a/*b/*"}) {
-    EXPECT_EQ(Parse(specification + " web\n"),
-              AtLine(1, "Unrecognized format for file/dir specification"))
-        << specification;
+    EXPECT_EQ(Parse(path + " web\n"), AtLine(1, "Unrecognized format for file/dir specification"))
+        << path;
   }
 }
 
