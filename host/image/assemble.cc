@@ -161,7 +161,7 @@ AssembleReport Assemble(const HostDirectory& host, const UnpackLimits& limits) {
   RemoveIndex(host.Ref());
   root.PutIntoPlace();
   state.Remove();
-  ReplaceFile(host.Ref(), kIndexFile, FormatImageIndex(index));
+  ReplaceFile(host.Ref(), kIndexFile, FormatImageIndex(index), Writers::kOne);
   return report;
 }
 

@@ -6,6 +6,7 @@
 #include <array>
 #include <cerrno>
 #include <cstdio>
+#include <utility>
 
 #include "host/image/system_failure.h"
 #include "host/image/unique_fd.h"
@@ -14,11 +15,17 @@ namespace StandIn {
 
 namespace {
 
+// The name of what is to take the place of a file. A name of the process's own where there may be
+// several of them; else always the same one, so that what a killed process left is found.
+std::string NameInTheMaking(const std::string& finalName, Writers writers) {
+  const std::string name = finalName + ".new";
+  return writers == Writers::kOne ? name : name + "." + std::to_string(::getpid());
+}
+
 // A file that vanishes at the end of its scope unless it has been given its final name.
 class TemporaryFile {
  public:
-  TemporaryFile(int dirFd, const std::string& finalName)
-      : dirFd_(dirFd), name_(finalName + ".new." + std::to_string(::getpid())) {}
+  TemporaryFile(int dirFd, std::string name) : dirFd_(dirFd), name_(std::move(name)) {}
   ~TemporaryFile() {
     if (exists_) {
       ::unlinkat(dirFd_, name_.c_str(), 0);
@@ -29,7 +36,7 @@ class TemporaryFile {
 
   // Each returns 0 or an errno.
   int Make() {
-    // A process of the same id may have been killed half-way; what it left holds nothing of use.
+    // A process that had this name too may have been killed half-way; what it left is of no use.
     ::unlinkat(dirFd_, name_.c_str(), 0);
     fd_ = UniqueFd(::openat(dirFd_, name_.c_str(),
                             O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0666));
@@ -118,7 +125,8 @@ std::string ReadFile(const DirectoryRef& dir, const std::string& name) {
   return *std::move(text);
 }
 
-void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text) {
+void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
+                 Writers writers) {
   const auto check = [&](int number) {
     if (number != 0) {
       throw SystemFailure(dir.PathOf(name), "written", number);
@@ -127,7 +135,7 @@ void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::st
   // Opened first: a directory that cannot be synced must be found out before anything is renamed.
   const UniqueFd directory(::openat(dir.fd, ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC));
   check(directory.IsOpen() ? 0 : errno);
-  TemporaryFile file(directory.Get(), name);
+  TemporaryFile file(directory.Get(), NameInTheMaking(name, writers));
   check(file.Make());
   check(file.Fill(text));
   check(file.TakeName(name));

@@ -27,14 +27,22 @@ void ReadBlocks(int fd, const std::string& file,
 // The same as one text.
 std::string ReadAll(int fd, const std::string& file);
 
+// Who else may be replacing the same file.
+enum class Writers {
+  kSeveral,  // anybody, at the same time: the later one wins
+  kOne,      // nobody: a lock sees to that
+};
+
 // Gives the file `name` in `dir` the content `text`: as a new file, which is synced and then takes
 // the name, whereupon the directory is synced. Whoever reads the name sees the old content or the
-// new one whole, also when this process or the machine stops at any moment. Two processes may
-// replace one file at a time: the later one wins.
+// new one whole, also when this process or the machine stops at any moment. What a process that was
+// stopped half-way left, nobody reads; where there is one writer at a time, it goes with the next
+// replacement.
 //
 // Throws HostError "DIR/NAME: cannot be written: REASON". The old file is then untouched and
 // nothing of the new one remains (except when the last step, syncing the directory, failed: the new
 // content has the name then, but may not survive a power failure).
-void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text);
+void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
+                 Writers writers = Writers::kSeveral);
 
 }  // namespace StandIn

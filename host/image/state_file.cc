@@ -77,7 +77,7 @@ std::optional<std::string> StateFile::Read() {
 }
 
 void StateFile::Write(const std::string& text) {
-  ReplaceFile(dir_, kStateFile, text);
+  ReplaceFile(dir_, kStateFile, text, Writers::kOne);
   Pin();
 }
 

@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 
 #include "host/host_error.h"
@@ -84,6 +85,20 @@ TEST_F(FileIoTest, WhatAKilledProcessLeftDoesntStandInTheWay) {
   EXPECT_EQ(ReadBytes(Path("f")), "text");
   EXPECT_EQ(ReadBytes(Path("elsewhere")), "untouched");
   EXPECT_THAT(NamesIn(Path()), testing::UnorderedElementsAre("f", "elsewhere"));
+}
+
+TEST_F(FileIoTest, OneWriterAtATimeRemovesWhatAKilledOneLeft) {
+  EXPECT_FALSE(ChildPassed(StartChild([&] {
+    const struct rlimit limit { 1000, 1000 };
+    const struct rlimit noCore {};
+    setrlimit(RLIMIT_CORE, &noCore);
+    setrlimit(RLIMIT_FSIZE, &limit);
+    ReplaceFile(Ref(), "f", std::string(2000, 'x'), Writers::kOne);  // is killed
+  })));
+  EXPECT_THAT(NamesIn(Path()), ElementsAre("f.new"));
+  ReplaceFile(Ref(), "f", "text", Writers::kOne);
+  EXPECT_EQ(ReadBytes(Path("f")), "text");
+  EXPECT_THAT(NamesIn(Path()), ElementsAre("f"));
 }
 
 TEST_F(FileIoTest, AReadOnlyDirectoryKeepsTheOldFile) {
