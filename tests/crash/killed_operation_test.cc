@@ -1,0 +1,136 @@
+// Processes that keep each operation by itself, and are killed at random moments.
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <filesystem>
+#include <iostream>
+
+#include "host/image/session.h"
+#include "secpolicy/secpolicy.h"
+#include "tests/crash/amount.h"
+#include "tests/crash/loading_host.h"
+#include "tests/crash/moments.h"
+#include "tests/crash/process_tree.h"
+#include "tests/crash/save_calls.h"
+#include "tests/crash/shared_memory.h"
+
+namespace CrashTest {
+namespace {
+
+using StandIn::UniqueFd;
+
+class KilledOperationTest : public LoadingHost {
+ protected:
+  KilledOperationTest() : LoadingHost(3, 8) {
+    std::filesystem::create_directory(Path("states"));
+    RecordStates();
+  }
+
+  // Loads the policy in this process, without a batch. `begun` is called before each operation is
+  // kept, when those before it have been.
+  void LoadInPieces(const std::function<void()>& begun) const {
+    const UniqueFd null(open("/dev/null", O_RDWR | O_CLOEXEC));
+    dup2(null.Get(), STDERR_FILENO);
+    const StandIn::SessionOptions options{
+        .visible = {PolicyDir()}, .trace = [&](const std::string&) { begun(); }, .faults = {}};
+    StandIn::Session session(StandIn::HostDirectory(Host()), options);
+    SecPolicy::LoadPolicy(PolicyDir());
+  }
+
+  // The same, counting the operations that were kept.
+  [[noreturn]] void BecomeLoad() const {
+    *kept_ = -1;
+    LoadInPieces([&] { ++*kept_; });
+    ++*kept_;
+    _exit(0);
+  }
+
+  // Expects the state after the operations that reported success, or after one more.
+  void ExpectStateAfterKept() const {
+    const auto kept = static_cast<std::size_t>(std::max(0, kept_->load()));
+    const std::string state = State();
+    const std::string& next = states_[std::min(kept + 1, states_.size() - 1)];
+    ASSERT_TRUE(state == states_[kept] || state == next) << "after " << kept << " operations:\n"
+                                                         << state;
+  }
+
+  [[nodiscard]] std::size_t Operations() const { return states_.size() - 1; }
+  [[nodiscard]] int Kept() const { return *kept_; }
+
+ private:
+  // states_[n] becomes the state after n operations of an undisturbed load.
+  void RecordStates() {
+    const UniqueFd host(open(Host().c_str(), O_PATH | O_CLOEXEC));
+    const UniqueFd states(open(Path("states").c_str(), O_PATH | O_CLOEXEC));
+    SetState(OldState());
+    ProcessTree load([&] {
+      int number = 0;
+      // Each is a file of its own, so that a second name keeps it.
+      const auto keep = [&] {
+        linkat(host.Get(), "kernel.json", states.Get(), std::to_string(number++).c_str(), 0);
+      };
+      LoadInPieces(keep);
+      keep();
+      _exit(0);
+    });
+    EXPECT_EQ(load.Wait(), 0);
+    for (int n = 0; std::filesystem::exists(Path("states/") + std::to_string(n)); ++n) {
+      states_.push_back(StandIn::ReadBytes(Path("states/") + std::to_string(n)));
+    }
+  }
+
+  Shared<std::atomic<int>> kept_;
+  std::vector<std::string> states_;
+};
+
+TEST_F(KilledOperationTest, NothingThatReportedSuccessIsLost) {
+  ASSERT_GT(Operations(), 50U);
+  EXPECT_TRUE(OldState() != NewState());
+  Moments moments(UndisturbedRun([&] { BecomeLoad(); }));
+  int unfinished = 0;
+  int during = 0;
+  const int kills = Either(30, 400);
+  for (int kill = 0; kill < kills && !HasFailure(); ++kill) {
+    SetState(OldState());
+    ProcessTree load([&] { BecomeLoad(); });
+    moments.Pause();
+    load.Kill();
+    unfinished += Kept() < static_cast<int>(Operations()) ? 1 : 0;
+    during += LeftOver().empty() ? 0 : 1;
+    ExpectStateAfterKept();
+    ExpectUsable();
+  }
+  std::cout << kills << " kills of a load of " << Operations()
+            << " operations kept one by one: " << unfinished << " before its end, " << during
+            << " of them in a save\n";
+  EXPECT_GT(unfinished, 0);
+}
+
+// The first save, one in the middle and the last are met at each of their calls.
+TEST_F(KilledOperationTest, KilledAtEachCallOfASave) {
+  if (!TracedProcess::IsPermitted()) GTEST_SKIP() << "processes cannot be traced here";
+  SetState(OldState());
+  int calls = 0;
+  {
+    SaveCalls load([&] { BecomeLoad(); });
+    while (load.Next()) ++calls;
+  }
+  ASSERT_GT(calls, 200);
+  constexpr int kEach = 12;
+  for (const int first : {0, calls / 2, calls - kEach}) {
+    for (int step = first; step < first + kEach && !HasFailure(); ++step) {
+      SetState(OldState());
+      SaveCalls load([&] { BecomeLoad(); });
+      for (int i = 0; i <= step; ++i) static_cast<void>(load.Next());
+      load.Kill();
+      ExpectStateAfterKept();
+      ExpectUsable();
+    }
+  }
+}
+
+}  // namespace
+}  // namespace CrashTest

@@ -1,0 +1,66 @@
+// Loads that are killed at each step of their save.
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/syscall.h>
+
+#include <algorithm>
+#include <iostream>
+
+#include "tests/crash/loading_host.h"
+#include "tests/crash/save_calls.h"
+
+namespace CrashTest {
+namespace {
+
+using testing::EndsWith;
+
+class SaveStepsTest : public LoadingHost {
+ protected:
+  SaveStepsTest() : LoadingHost(2, 20) {}
+
+  void SetUp() override {
+    if (!TracedProcess::IsPermitted()) GTEST_SKIP() << "processes cannot be traced here";
+  }
+
+  [[nodiscard]] SaveCalls StartedLoad() const {
+    SetState(OldState());
+    return SaveCalls([&] { BecomeLoad(); });
+  }
+};
+
+TEST_F(SaveStepsTest, UndisturbedSaveWritesSyncsRenamesAndSyncs) {
+  SaveCalls load = StartedLoad();
+  std::vector<std::string> names;
+  while (const auto call = load.Next()) names.push_back(NameOf(*call));
+  std::erase_if(names, [](const std::string& name) {
+    return name != "write" && name != "fsync" && name != "rename" && name != "open";
+  });
+  EXPECT_THAT(names, testing::ElementsAre("open", "write", "fsync", "rename", "fsync", "open"));
+  EXPECT_EQ(load.ExitStatus(), 0);
+  EXPECT_TRUE(State() == NewState());
+}
+
+TEST_F(SaveStepsTest, KilledBeforeEachCallFromTheFirstOfTheSave) {
+  bool isRenamed = false;
+  for (int step = 0;; ++step) {
+    SaveCalls load = StartedLoad();
+    auto call = load.Next();
+    for (int i = 0; i < step && call; ++i) {
+      isRenamed |= NameOf(*call) == "rename";
+      call = load.Next();
+    }
+    if (!call) break;
+    const std::string name = NameOf(*call);
+    load.Kill();
+    EXPECT_TRUE(State() == (isRenamed ? NewState() : OldState()))
+        << "killed before call " << step << ", " << name;
+    std::cout << "killed before call " << step << " of the save, " << name << ": the "
+              << (isRenamed ? "new" : "old") << " state\n";
+    ExpectUsable();
+    if (HasFailure()) break;
+  }
+  EXPECT_TRUE(isRenamed);
+}
+
+}  // namespace
+}  // namespace CrashTest
