@@ -78,15 +78,23 @@ int LoadIn(StandIn::HostDirectory host, const LoadArguments& arguments) {
   return status;
 }
 
+// The load may have been over but for its exit, or another process may have written.
+std::string WhatTheKernelHolds(bool isWritten) {
+  return isWritten ? "the kernel's state has been written since it began, see \"secpolicy show\""
+                   : "the kernel holds what it held before";
+}
+
 ExitStatus Load(const LoadArguments& arguments) {
   StandIn::HostDirectory host = OpenHost(arguments.host);
+  const StandIn::StateFile state(host);
+  const StandIn::StateFile::Version before = state.CurrentVersion();
   const int status = RunInChild([&] { return LoadIn(std::move(host), arguments); },
                                 [](std::string& line) {
                                   if (FilterProgress(line)) std::cerr << line + "\n";
                                 });
   if (WIFSIGNALED(status)) {
-    ReportError(std::string("the load was killed (") + strsignal(WTERMSIG(status)) +
-                "); the kernel holds what it held before");
+    ReportError(std::string("the load was killed (") + strsignal(WTERMSIG(status)) + "); " +
+                WhatTheKernelHolds(state.ChangedSince(before)));
     return kFailed;
   }
   return static_cast<ExitStatus>(WEXITSTATUS(status));
