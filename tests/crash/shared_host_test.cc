@@ -57,7 +57,7 @@ TEST_F(SharedHostTest, OfTwentyProcessesNoOperationIsLostOrDoubled) {
   Assembled();
   KeptModule(Host()).Create("commonDom");
   const DomainId common = 1;
-  const int operations = Either(60, 1500);
+  const int operations = Either(60, 600);
   const auto start = std::chrono::steady_clock::now();
   std::vector<pid_t> users;
   for (int user = 0; user < kUsers; ++user) {
