@@ -9,14 +9,14 @@ namespace CrashTest {
 
 namespace {
 
-constexpr int kRulesEach = 25;
+constexpr std::size_t kRulesEach = 25;
 constexpr unsigned int kPermissions[] = {0x1, 0x3, 0x11, 0x13};
 
-std::string NameOfDomain(int user, int domain) {
+std::string NameOfDomain(std::size_t user, std::size_t domain) {
   return "dom" + std::to_string(user) + "-" + std::to_string(domain);
 }
 
-std::string ContestedName(int name) { return "contested" + std::to_string(name); }
+std::string ContestedName(std::size_t name) { return "contested" + std::to_string(name); }
 
 // Tells everybody that a domain is being changed, as long as this lives.
 class Changing {
@@ -32,7 +32,7 @@ class Changing {
 
 }  // namespace
 
-HostUser::HostUser(int number, unsigned int common, Board& board, OperationLog& log)
+HostUser::HostUser(std::size_t number, unsigned int common, Board& board, OperationLog& log)
     : number_(number),
       common_(common),
       board_(board),
@@ -78,7 +78,7 @@ unsigned int HostUser::SlotOf(const std::string& name) {
 }
 
 void HostUser::ChangeOwnDomain() {
-  const int which = Below(kDomainsEach);
+  const std::size_t which = Below(kDomainsEach);
   Board::Domain& domain = board_.domains.at(number_).at(which);
   const std::string name = NameOfDomain(number_, which);
   const Changing changing(domain);
@@ -91,7 +91,7 @@ void HostUser::ChangeOwnDomain() {
 }
 
 void HostUser::LookUpOwnDomain() {
-  const int which = Below(kDomainsEach);
+  const std::size_t which = Below(kDomainsEach);
   const unsigned int slot = board_.domains.at(number_).at(which).slot;
   EXPECT_EQ(SlotOf(NameOfDomain(number_, which)), slot);
   if (slot == 0) return;
@@ -100,8 +100,8 @@ void HostUser::LookUpOwnDomain() {
 
 // Its owner may change it at any time; the answer is only known when it didn't.
 void HostUser::LookUpAnothersDomain() {
-  const int user = Below(kUsers);
-  const int which = Below(kDomainsEach);
+  const std::size_t user = Below(kUsers);
+  const std::size_t which = Below(kDomainsEach);
   Board::Domain& domain = board_.domains.at(user).at(which);
   const std::uint64_t changes = domain.changes;
   const unsigned int slot = domain.slot;
@@ -112,7 +112,7 @@ void HostUser::LookUpAnothersDomain() {
 }
 
 void HostUser::TakeContestedName() {
-  const int name = Below(kContested);
+  const std::size_t name = Below(kContested);
   if (contested_.contains(name)) return;
   try {
     contested_[name] = Create(ContestedName(name));
@@ -154,7 +154,7 @@ void HostUser::SetRule() {
 
 void HostUser::RemoveRule() {
   if (rules_.empty()) return;
-  const auto rule = std::next(rules_.begin(), Below(static_cast<int>(rules_.size())));
+  const auto rule = std::next(rules_.begin(), static_cast<std::ptrdiff_t>(Below(rules_.size())));
   SecPolicy::RemoveFilePolicy(0, common_, rule->first);
   log_.Removed(rule->first);
   rules_.erase(rule);
@@ -163,7 +163,7 @@ void HostUser::RemoveRule() {
 void HostUser::CountRules() {
   const unsigned int count = SecPolicy::RetrieveNumberOfFilePolicies(common_);
   EXPECT_GE(count, rules_.size());
-  EXPECT_LE(count, static_cast<unsigned int>(kUsers * kRulesEach));
+  EXPECT_LE(count, kUsers * kRulesEach);
 }
 
 }  // namespace CrashTest

@@ -3,6 +3,7 @@
 
 #include <array>
 #include <atomic>
+#include <cstddef>
 #include <cstdint>
 #include <map>
 #include <random>
@@ -13,10 +14,10 @@
 
 namespace CrashTest {
 
-constexpr int kUsers = 20;
-constexpr int kDomainsEach = 4;
-constexpr int kContested = 3;
-constexpr int kSlots = 1024;
+constexpr std::size_t kUsers = 20;
+constexpr std::size_t kDomainsEach = 4;
+constexpr std::size_t kContested = 3;
+constexpr std::size_t kSlots = 1024;
 
 // What all users know of each other at any moment.
 struct Board {
@@ -36,7 +37,7 @@ struct Board {
 class HostUser {
  public:
   // `common` is the domain to which all users add rules. `board` and `log` must outlive this.
-  HostUser(int number, unsigned int common, Board& board, OperationLog& log);
+  HostUser(std::size_t number, unsigned int common, Board& board, OperationLog& log);
 
   void DoSomething();
   // Gives back the names that others may want.
@@ -55,17 +56,19 @@ class HostUser {
   void Destroy(const std::string& name, unsigned int id);
   // The slot of the domain of that name: its id and 1, or 0.
   unsigned int SlotOf(const std::string& name);
-  int Below(int end) { return std::uniform_int_distribution<int>(0, end - 1)(random_); }
+  std::size_t Below(std::size_t end) {
+    return std::uniform_int_distribution<std::size_t>(0, end - 1)(random_);
+  }
   [[nodiscard]] std::string RandomPath();
 
-  int number_;
+  std::size_t number_;
   unsigned int common_;
   Board& board_;
   OperationLog& log_;
   std::mt19937 random_;
   SecPolicy::ZekAccessInterfaceImpl interface_;
-  std::map<int, unsigned int> contested_;      // the names that this user has, and their ids
-  std::map<std::string, unsigned int> rules_;  // of this user in the common domain
+  std::map<std::size_t, unsigned int> contested_;  // the names that this user has, and their ids
+  std::map<std::string, unsigned int> rules_;      // of this user in the common domain
 };
 
 }  // namespace CrashTest

@@ -1,6 +1,7 @@
 // What the users of one host report of their operations.
 #pragma once
 
+#include <cstddef>
 #include <fstream>
 #include <map>
 #include <string>
@@ -29,7 +30,7 @@ class OperationLog {
 struct Account {
   std::map<std::string, unsigned int> domains;  // and their ids
   std::map<std::string, unsigned int> rules;    // paths and permissions
-  int operations = 0;
+  std::size_t operations = 0;
   std::string contradiction;  // the first line that cannot be true after those above it
 
   // Adds one process's log; nobody else may have used its names at the same time.

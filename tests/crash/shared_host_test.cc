@@ -18,14 +18,16 @@ using StandIn::KeptModule;
 
 class SharedHostTest : public StandIn::SessionTest {
  protected:
-  [[nodiscard]] std::string LogOf(int user) const { return Visible() + "/" + std::to_string(user); }
+  [[nodiscard]] std::string LogOf(std::size_t user) const {
+    return Visible() + "/" + std::to_string(user);
+  }
 
   // Runs a user of the host, in this process.
-  void Use(int user, DomainId common, int operations) const {
+  void Use(std::size_t user, DomainId common, std::size_t operations) const {
     OperationLog log(LogOf(user));
     Enter({}, [&](StandIn::Session&) {
       HostUser self(user, common, *board_, log);
-      for (int i = 0; i < operations; ++i) self.DoSomething();
+      for (std::size_t i = 0; i < operations; ++i) self.DoSomething();
       self.GiveBackContestedNames();
     });
   }
@@ -46,7 +48,7 @@ class SharedHostTest : public StandIn::SessionTest {
 
   [[nodiscard]] Account Logged() const {
     Account logged;
-    for (int user = 0; user < kUsers; ++user) logged.Add(LogOf(user));
+    for (std::size_t user = 0; user < kUsers; ++user) logged.Add(LogOf(user));
     return logged;
   }
 
@@ -57,10 +59,10 @@ TEST_F(SharedHostTest, OfTwentyProcessesNoOperationIsLostOrDoubled) {
   Assembled();
   KeptModule(Host()).Create("commonDom");
   const DomainId common = 1;
-  const int operations = Either(60, 600);
+  const auto operations = static_cast<std::size_t>(Either(60, 600));
   const auto start = std::chrono::steady_clock::now();
   std::vector<pid_t> users;
-  for (int user = 0; user < kUsers; ++user) {
+  for (std::size_t user = 0; user < kUsers; ++user) {
     users.push_back(StandIn::StartChild([&] { Use(user, common, operations); }));
   }
   for (const pid_t user : users) EXPECT_TRUE(StandIn::ChildPassed(user));
