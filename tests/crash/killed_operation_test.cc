@@ -22,6 +22,9 @@ namespace {
 
 using StandIn::UniqueFd;
 
+// Makes the file, writes, syncs, renames, syncs, closes twice, opens, and asks for the version.
+constexpr int kCallsOfASave = 9;
+
 class KilledOperationTest : public LoadingHost {
  protected:
   KilledOperationTest() : LoadingHost(3, 8) {
@@ -49,16 +52,37 @@ class KilledOperationTest : public LoadingHost {
   }
 
   // Expects the state after the operations that reported success, or after one more.
-  void ExpectStateAfterKept() const {
+  void ExpectStateAfterKept() {
     const auto kept = static_cast<std::size_t>(std::max(0, kept_->load()));
     const std::string state = State();
     const std::string& next = states_[std::min(kept + 1, states_.size() - 1)];
     ASSERT_TRUE(state == states_[kept] || state == next) << "after " << kept << " operations:\n"
                                                          << state;
+    found_.insert(state);
   }
 
   [[nodiscard]] std::size_t Operations() const { return states_.size() - 1; }
   [[nodiscard]] int Kept() const { return *kept_; }
+  [[nodiscard]] std::size_t DifferentStatesFound() const { return found_.size(); }
+
+  // The numbers of the calls, from that which begins the first save, that begin a save.
+  [[nodiscard]] std::vector<int> FirstCallsOfSaves() const {
+    SetState(OldState());
+    SaveCalls load([&] { BecomeLoad(); });
+    std::vector<int> first;
+    for (int number = 0; const auto call = load.Next(); ++number) {
+      if (BeginsSave(*call)) first.push_back(number);
+    }
+    return first;
+  }
+
+  // Kills a load at the call of that number.
+  void KillAtCall(int number) const {
+    SetState(OldState());
+    SaveCalls load([&] { BecomeLoad(); });
+    for (int i = 0; i <= number; ++i) static_cast<void>(load.Next());
+    load.Kill();
+  }
 
  private:
   // states_[n] becomes the state after n operations of an undisturbed load.
@@ -83,6 +107,7 @@ class KilledOperationTest : public LoadingHost {
   }
 
   Shared<std::atomic<int>> kept_;
+  std::set<std::string> found_;
   std::vector<std::string> states_;
 };
 
@@ -105,27 +130,18 @@ TEST_F(KilledOperationTest, NothingThatReportedSuccessIsLost) {
   }
   std::cout << kills << " kills of a load of " << Operations()
             << " operations kept one by one: " << unfinished << " before its end, " << during
-            << " of them in a save\n";
+            << " of them in a save; " << DifferentStatesFound() << " different states were found\n";
   EXPECT_GT(unfinished, 0);
 }
 
-// The first save, one in the middle and the last are met at each of their calls.
+// The first save, one in the middle and the last, each at each of its calls.
 TEST_F(KilledOperationTest, KilledAtEachCallOfASave) {
   if (!TracedProcess::IsPermitted()) GTEST_SKIP() << "processes cannot be traced here";
-  SetState(OldState());
-  int calls = 0;
-  {
-    SaveCalls load([&] { BecomeLoad(); });
-    while (load.Next()) ++calls;
-  }
-  ASSERT_GT(calls, 200);
-  constexpr int kEach = 12;
-  for (const int first : {0, calls / 2, calls - kEach}) {
-    for (int step = first; step < first + kEach && !HasFailure(); ++step) {
-      SetState(OldState());
-      SaveCalls load([&] { BecomeLoad(); });
-      for (int i = 0; i <= step; ++i) static_cast<void>(load.Next());
-      load.Kill();
+  const std::vector<int> saves = FirstCallsOfSaves();
+  ASSERT_GT(saves.size(), 20U);
+  for (const int first : {saves.front(), saves[saves.size() / 2], saves.back()}) {
+    for (int call = first; call < first + kCallsOfASave && !HasFailure(); ++call) {
+      KillAtCall(call);
       ExpectStateAfterKept();
       ExpectUsable();
     }

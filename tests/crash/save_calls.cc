@@ -7,15 +7,10 @@
 
 namespace CrashTest {
 
-namespace {
-
-// Makes the file that is to become kernel.json.
 bool BeginsSave(const PendingCall& call) {
   return call.number == SYS_openat && (call.arguments[2] & O_CREAT) != 0 &&
          call.TextAt(call.arguments[1]).starts_with("kernel.json");
 }
-
-}  // namespace
 
 std::string NameOf(const PendingCall& call) {
   static const std::map<std::uint64_t, std::string> kNames = {

@@ -12,6 +12,9 @@ namespace CrashTest {
 // "open", "write", "fsync", "rename", "unlink", "close", "lock", "exit"; else the call's number.
 std::string NameOf(const PendingCall& call);
 
+// Whether the call makes the file that is to become kernel.json.
+bool BeginsSave(const PendingCall& call);
+
 // A traced process and whatever it starts, which run freely up to a save.
 class SaveCalls {
  public:
