@@ -45,10 +45,15 @@ class KilledOperationTest : public LoadingHost {
 
   // The same, counting the operations that were kept.
   [[noreturn]] void BecomeLoad() const {
-    *kept_ = -1;
     LoadInPieces([&] { ++*kept_; });
     ++*kept_;
     _exit(0);
+  }
+
+  // Back to where nothing of the load has been done.
+  void StartAnew() const {
+    SetState(OldState());
+    *kept_ = -1;
   }
 
   // Expects the state after the operations that reported success, or after one more.
@@ -67,7 +72,7 @@ class KilledOperationTest : public LoadingHost {
 
   // The numbers of the calls, from that which begins the first save, that begin a save.
   [[nodiscard]] std::vector<int> FirstCallsOfSaves() const {
-    SetState(OldState());
+    StartAnew();
     SaveCalls load([&] { BecomeLoad(); });
     std::vector<int> first;
     for (int number = 0; const auto call = load.Next(); ++number) {
@@ -78,7 +83,7 @@ class KilledOperationTest : public LoadingHost {
 
   // Kills a load at the call of that number.
   void KillAtCall(int number) const {
-    SetState(OldState());
+    StartAnew();
     SaveCalls load([&] { BecomeLoad(); });
     for (int i = 0; i <= number; ++i) static_cast<void>(load.Next());
     load.Kill();
@@ -114,12 +119,13 @@ class KilledOperationTest : public LoadingHost {
 TEST_F(KilledOperationTest, NothingThatReportedSuccessIsLost) {
   ASSERT_GT(Operations(), 50U);
   EXPECT_TRUE(OldState() != NewState());
+  StartAnew();
   Moments moments(UndisturbedRun([&] { BecomeLoad(); }));
   int unfinished = 0;
   int during = 0;
   const int kills = Either(30, 400);
   for (int kill = 0; kill < kills && !HasFailure(); ++kill) {
-    SetState(OldState());
+    StartAnew();
     ProcessTree load([&] { BecomeLoad(); });
     moments.Pause();
     load.Kill();
