@@ -1,7 +1,6 @@
 // Processes that keep each operation by itself, and are killed at random moments.
 #include <fcntl.h>
 #include <gmock/gmock.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <atomic>

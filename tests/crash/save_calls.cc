@@ -14,9 +14,9 @@ bool BeginsSave(const PendingCall& call) {
 
 std::string NameOf(const PendingCall& call) {
   static const std::map<std::uint64_t, std::string> kNames = {
-      {SYS_openat, "open"},     {SYS_write, "write"},     {SYS_fsync, "fsync"},
-      {SYS_renameat, "rename"}, {SYS_unlinkat, "unlink"}, {SYS_close, "close"},
-      {SYS_fcntl, "lock"},      {SYS_exit_group, "exit"},
+      {SYS_openat, "open"},     {SYS_write, "write"},      {SYS_fsync, "fsync"},
+      {SYS_renameat, "rename"}, {SYS_renameat2, "rename"}, {SYS_unlinkat, "unlink"},
+      {SYS_close, "close"},     {SYS_fcntl, "lock"},       {SYS_exit_group, "exit"},
   };
   const auto found = kNames.find(call.number);
   return found != kNames.end() ? found->second : "call " + std::to_string(call.number);

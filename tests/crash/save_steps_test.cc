@@ -1,7 +1,5 @@
 // Loads that are killed at each step of their save.
-#include <fcntl.h>
 #include <gmock/gmock.h>
-#include <sys/syscall.h>
 
 #include <algorithm>
 #include <iostream>
@@ -31,26 +29,30 @@ class SaveStepsTest : public LoadingHost {
 TEST_F(SaveStepsTest, UndisturbedSaveWritesSyncsRenamesAndSyncs) {
   SaveCalls load = StartedLoad();
   std::vector<std::string> names;
-  while (const auto call = load.Next()) names.push_back(NameOf(*call));
+  while (const auto call = load.Next()) {
+    // What follows is the process's end, at which a sanitizer may have something to say.
+    if (std::count(names.begin(), names.end(), "fsync") < 2) names.push_back(NameOf(*call));
+  }
   std::erase_if(names, [](const std::string& name) {
-    return name != "write" && name != "fsync" && name != "rename" && name != "open";
+    return name != "open" && name != "write" && name != "fsync" && name != "rename";
   });
-  EXPECT_THAT(names, testing::ElementsAre("open", "write", "fsync", "rename", "fsync", "open"));
+  EXPECT_THAT(names, testing::ElementsAre("open", "write", "fsync", "rename", "fsync"));
   EXPECT_EQ(load.ExitStatus(), 0);
   EXPECT_TRUE(State() == NewState());
 }
 
-TEST_F(SaveStepsTest, KilledBeforeEachCallFromTheFirstOfTheSave) {
+TEST_F(SaveStepsTest, KilledBeforeEachCallUntilTheLockIsGivenUp) {
   bool isRenamed = false;
-  for (int step = 0;; ++step) {
+  std::string name;
+  for (int step = 0; name != "lock"; ++step) {
     SaveCalls load = StartedLoad();
     auto call = load.Next();
     for (int i = 0; i < step && call; ++i) {
       isRenamed |= NameOf(*call) == "rename";
       call = load.Next();
     }
-    if (!call) break;
-    const std::string name = NameOf(*call);
+    ASSERT_TRUE(call.has_value());
+    name = NameOf(*call);
     load.Kill();
     EXPECT_TRUE(State() == (isRenamed ? NewState() : OldState()))
         << "killed before call " << step << ", " << name;
