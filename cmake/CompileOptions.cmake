@@ -34,3 +34,5 @@ endif()
 if(SECPOLICY_FUZZ)
   target_compile_options(secpolicy_options INTERFACE -fsanitize=fuzzer-no-link)
 endif()
+
+include(${CMAKE_CURRENT_LIST_DIR}/Hardening.cmake)
