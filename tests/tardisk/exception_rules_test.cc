@@ -43,6 +43,13 @@ class ExceptionRulesTest : public TardiskTest {
   }
 };
 
+TEST(TardiskRulesTest, KeepTheKeywordThatTheyAreFiledUnder) {
+  SecPolicy::TardiskExceptionRules rules;
+  EXPECT_EQ(rules.Keyword(), "");
+  rules.SetKeyword("-E");
+  EXPECT_EQ(rules.Keyword(), "-E");
+}
+
 TEST_F(ExceptionRulesTest, TardiskIsLabelledThenTheTransitionIsSentTwice) {
   Prepare();
   const Outcome outcome = AddAndSet({"web appDom"});
