@@ -34,7 +34,7 @@ constexpr char kUserOverridesModes[] =
     "an ordinary user enters a host by a namespace that overrides the modes of its own files";
 
 void LimitFileSize() {
-  const struct rlimit limit { 500, 500 };
+  const struct rlimit limit { 500, RLIM_INFINITY };
   const struct rlimit noCore {};
   setrlimit(RLIMIT_CORE, &noCore);
   setrlimit(RLIMIT_FSIZE, &limit);

@@ -126,9 +126,6 @@ StandIn::SessionOptions HostTest::Options() const {
   // The search for leaks at the process's end reads it.
   options.visible.push_back("/proc");
 #endif
-#if defined(SECPOLICY_COVERAGE_DIR)
-  options.visible.push_back(SECPOLICY_COVERAGE_DIR);
-#endif
   options.faults = faults_;
   return options;
 }

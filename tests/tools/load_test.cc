@@ -129,8 +129,10 @@ TEST_F(LoadTest, WhatATerminatedLoadInstalledIsShownLater) {
 
 // A state that may not be written: a file may have no byte more.
 void ForbidWriting() {
-  const rlimit none{0, 0};
-  setrlimit(RLIMIT_FSIZE, &none);
+  rlimit size{};
+  getrlimit(RLIMIT_FSIZE, &size);
+  size.rlim_cur = 0;
+  setrlimit(RLIMIT_FSIZE, &size);
 }
 
 TEST_F(LoadTest, LoadThatIsKilledLeavesTheKernelAsItWas) {
