@@ -1,37 +1,60 @@
 // The kept state of a module: it is refused with HostError and changes nothing, or it is taken over
-// and saved as it was read the next time.
-#include <cstdint>
-#include <cstdlib>
-#include <string>
-
+// and saved as it was read the next time; what was taken over answers every question.
+#include "fuzz/support/input.h"
+#include "fuzz/support/require.h"
+#include "fuzz/support/small_world.h"
 #include "host/host_error.h"
-#include "host/module/description_json.h"
-#include "host/module/simulated_module.h"
 
 namespace {
 
-class OneProcess final : public StandIn::ProcessTable {
- public:
-  StandIn::ProcessIdentity Self() const override { return {1, 1}; }
-  bool Runs(const StandIn::ProcessIdentity& process) const override { return process == Self(); }
-};
+using StandIn::LabelType;
+using StandIn::RuleKind;
+
+void RequireRulesOf(StandIn::SecurityModule& module, StandIn::DomainId domain) {
+  for (std::size_t kind = 0; kind < StandIn::kRuleKinds; ++kind) {
+    for (const StandIn::Rule& rule : module.Rules(static_cast<RuleKind>(kind), domain)) {
+      Fuzz::Require(rule.words.size() == InfoOf(static_cast<RuleKind>(kind)).words,
+                    "a rule has the words of its kind");
+      if (static_cast<RuleKind>(kind) == RuleKind::kTransition) {
+        Fuzz::Require(module.GetDomainInfo(rule.targetDomain).has_value(), "a target exists");
+      }
+    }
+  }
+  Fuzz::Require(module.FileRules(domain).size() == module.CountFileRules(domain),
+                "file rules are counted");
+}
+
+void RequireWhole(StandIn::SecurityModule& module) {
+  for (StandIn::DomainId id = 0; id < module.MaxDomains(); ++id) {
+    const auto info = module.GetDomainInfo(id);
+    if (!info) continue;
+    Fuzz::Require(module.FindDomain(info->name) == id, "a domain is found by its name");
+    RequireRulesOf(module, id);
+  }
+  for (const auto& [name, id] : module.Words(StandIn::WordList::kObjects)) {
+    Fuzz::Require(module.LookupLabel(name, LabelType::kObject) == static_cast<unsigned long>(id),
+                  "a label has one id");
+  }
+  Fuzz::Require(module.LeakedDomains().size() < module.MaxDomains(),
+                "the first domain never leaks");
+}
 
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
-  static const OneProcess processes;
-  static const auto description =
-      StandIn::ReadDescription(StandIn::DefaultDescriptionText(), "host.json");
-  StandIn::SimulatedModule module(description, processes);
+  static const SecPolicyTest::OneProcess processes;
+  StandIn::SimulatedModule module(Fuzz::SmallDescription(), processes);
   const std::string before = module.Save();
   try {
-    module.Restore(std::string(data, data + size), "kernel.json");
-  } catch (const StandIn::HostError&) {
-    if (module.Save() != before) std::abort();
+    module.Restore(Fuzz::BytesOf(data, size), "kernel.json");
+  } catch (const StandIn::HostError& error) {
+    Fuzz::Require(std::string(error.what()).starts_with("kernel.json:"), "the file is named");
+    Fuzz::RequireEqual(module.Save(), before, "a refused state changes nothing");
     return 0;
   }
   const std::string saved = module.Save();
+  RequireWhole(module);
   module.Restore(saved, "kernel.json");
-  if (module.Save() != saved) std::abort();
+  Fuzz::RequireEqual(module.Save(), saved, "a state is saved as it was read");
   return 0;
 }
