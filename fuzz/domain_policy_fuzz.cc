@@ -3,7 +3,7 @@
 #include <iostream>
 
 #include "domain/domain_policy.h"
-#include "fuzz/support/captured.h"
+#include "tests/support/captured.h"
 #include "fuzz/support/input.h"
 #include "fuzz/support/plain_policy.h"
 #include "fuzz/support/require.h"
@@ -24,7 +24,7 @@ std::string RefusalOf(const Action& action) try {
 }
 
 std::string PrintedBy(SecPolicy::DomainPolicy& policy) {
-  const Fuzz::Captured out(std::cout);
+  const SecPolicyTest::Captured out(std::cout);
   policy.PrintPolicy();
   return out.Text();
 }

@@ -3,7 +3,7 @@
 #include <iostream>
 
 #include "domain/domain_policy.h"
-#include "fuzz/support/captured.h"
+#include "tests/support/captured.h"
 #include "fuzz/support/input.h"
 #include "fuzz/support/plain_reader.h"
 #include "fuzz/support/require.h"
@@ -55,10 +55,10 @@ class Kernel {
   std::string Printed() {
     SecPolicy::ZekAccessInterfaceImpl iface;
     SecPolicy::DomainPolicy policy("appDom", Fuzz::kAppDomain);
-    const Fuzz::Captured errors(std::cerr);
+    const SecPolicyTest::Captured errors(std::cerr);
     policy.ReadSystemPolicy(iface);
     Fuzz::RequireEqual(errors.Text(), "", "every rule type can be read");
-    const Fuzz::Captured out(std::cout);
+    const SecPolicyTest::Captured out(std::cout);
     policy.PrintPolicy();
     return out.Text();
   }

@@ -2,7 +2,7 @@
 // bad one are applied in their order, each named by its line when it fails.
 #include <iostream>
 
-#include "fuzz/support/captured.h"
+#include "tests/support/captured.h"
 #include "fuzz/support/input.h"
 #include "fuzz/support/plain_policy.h"
 #include "fuzz/support/refused_look_ups.h"
@@ -29,7 +29,7 @@ std::string ExpectedErrors(const std::string& file, const std::vector<Fuzz::Plai
 // What setting the labels logs; it is to fail when there is a mapping.
 std::string ErrorsOf(SecPolicy::FileLabelPolicy& policy, SecPolicy::ZekAccessInterfaceImpl& iface,
                      bool isToFail) {
-  const Fuzz::Captured errors(std::cerr);
+  const SecPolicyTest::Captured errors(std::cerr);
   std::string refusal;
   try {
     policy.SetFileLabels(iface);

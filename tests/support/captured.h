@@ -5,7 +5,7 @@
 #include <sstream>
 #include <string>
 
-namespace Fuzz {
+namespace SecPolicyTest {
 
 // Keeps what goes through `stream` as long as this object lives.
 class Captured {
@@ -23,4 +23,4 @@ class Captured {
   std::streambuf* before_;
 };
 
-}  // namespace Fuzz
+}  // namespace SecPolicyTest
