@@ -1,0 +1,29 @@
+// What the library threw and what the kernel holds, in the words of CorpusCase.
+#pragma once
+
+#include <string>
+
+#include "host/module/rule.h"
+#include "platform/tavon_exception.h"
+
+namespace SecPolicyTest {
+
+// What the held file carries before each file of labels; near to no word.
+inline const std::string kFirstLabel(60, '~');
+
+// The text of the TavonException that `action` throws; empty for none.
+template <typename Action>
+std::string RefusalOf(const Action& action) try {
+  action();
+  return "";
+} catch (const Tavon::Lib::TavonException& failure) {
+  return failure.what();
+}
+
+// `text` with the mark of a file's path instead of `path`.
+std::string WithFileMark(std::string text, const std::string& path);
+
+// A rule as the kernel holds it: line, keyword, words, a target's id, decision.
+std::string RecordOf(StandIn::RuleKind kind, const StandIn::Rule& rule);
+
+}  // namespace SecPolicyTest
