@@ -3,11 +3,11 @@
 #include <iostream>
 
 #include "domain/domain_policy.h"
-#include "tests/support/captured.h"
 #include "fuzz/support/input.h"
 #include "fuzz/support/plain_policy.h"
 #include "fuzz/support/require.h"
 #include "fuzz/support/small_world.h"
+#include "tests/support/captured.h"
 #include "tests/support/memory_file.h"
 
 namespace {

@@ -3,13 +3,13 @@
 #include <iostream>
 
 #include "domain/domain_policy.h"
-#include "tests/support/captured.h"
 #include "fuzz/support/input.h"
 #include "fuzz/support/plain_reader.h"
 #include "fuzz/support/require.h"
 #include "fuzz/support/small_world.h"
 #include "host/gate/gate.h"
 #include "host/module/module_error.h"
+#include "tests/support/captured.h"
 #include "tests/support/memory_file.h"
 #include "tests/support/system_log.h"
 

@@ -2,13 +2,13 @@
 // bad one are applied in their order, each named by its line when it fails.
 #include <iostream>
 
-#include "tests/support/captured.h"
 #include "fuzz/support/input.h"
 #include "fuzz/support/plain_policy.h"
 #include "fuzz/support/refused_look_ups.h"
 #include "fuzz/support/require.h"
 #include "fuzz/support/small_world.h"
 #include "labels/file_label_policy.h"
+#include "tests/support/captured.h"
 #include "tests/support/memory_file.h"
 #include "tests/support/system_log.h"
 

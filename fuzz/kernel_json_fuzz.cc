@@ -22,6 +22,8 @@ void RequireRulesOf(StandIn::SecurityModule& module, StandIn::DomainId domain) {
   }
   Fuzz::Require(module.FileRules(domain).size() == module.CountFileRules(domain),
                 "file rules are counted");
+  Fuzz::Require(module.CountFileRules(domain) <= Fuzz::SmallDescription().limits.fileRulesPerDomain,
+                "file rules are within their limit");
 }
 
 void RequireWhole(StandIn::SecurityModule& module) {

@@ -1,17 +1,13 @@
 // The private system calls with whatever numbers, addresses and lengths: answers within what is
 // documented, no byte written but to where the call's results go, nothing changed by a call that
 // is refused, and a state that can be saved and restored.
-#include <algorithm>
 #include <array>
-#include <cerrno>
 #include <cstring>
-#include <initializer_list>
 
 #include "fuzz/support/caller_memory.h"
+#include "fuzz/support/private_call_facts.h"
 #include "fuzz/support/require.h"
 #include "fuzz/support/small_world.h"
-#include "host/gate/private_call_answers.h"
-#include "platform/private_calls.h"
 #include "platform/zek_access.h"
 
 namespace {
@@ -22,88 +18,6 @@ using ZekCtl::Kernel::PrivateCall;
 using ZekCtl::Security::ZekAccess_FileRule;
 
 constexpr std::size_t kMostCalls = 16;
-constexpr long kRefusedStatus = 0x0bad0000;
-
-// What a call may be refused with, besides EFAULT.
-struct Refusals {
-  PrivateCall call;
-  std::initializer_list<int> numbers;
-};
-
-const std::array<Refusals, 11> kRefusals{{
-    {PrivateCall::kCreateDomain, {EINVAL, ENAMETOOLONG, EEXIST, ENOSPC}},
-    {PrivateCall::kDestroyDomain, {ENOENT, EBUSY}},
-    {PrivateCall::kUpdateRule, {ENOENT, EINVAL, ENAMETOOLONG}},
-    {PrivateCall::kRemoveRule, {ENOENT, ENAMETOOLONG}},
-    {PrivateCall::kReadRules, {ENOENT}},
-    {PrivateCall::kCountRules, {ENOENT}},
-    {PrivateCall::kAddRules, {ENOENT, ESRCH, EINVAL, ENAMETOOLONG, ENOSPC}},
-    {PrivateCall::kLeakedDomains, {}},
-    {PrivateCall::kWorldDomain, {ESRCH}},
-    {PrivateCall::kDomainName, {ENOENT, ERANGE}},
-    {PrivateCall::kReplacePath, {ENOENT, EINVAL, ENAMETOOLONG}},
-}};
-
-bool IsDocumented(PrivateCall call, int number) {
-  for (const Refusals& refusals : kRefusals) {
-    if (refusals.call != call) continue;
-    for (const int known : refusals.numbers) {
-      if (known == number) return true;
-    }
-    return number == EFAULT;
-  }
-  return number == ENOSYS;
-}
-
-void RequireDocumented(PrivateCall call, const PrivateAnswer& answer) {
-  if (answer.status == 0) {
-    Fuzz::Require(answer.error == 0, "a call that is done has no error value");
-  } else if (answer.status == ZekCtl::Kernel::kStatusTableTooSmall) {
-    Fuzz::Require(call == PrivateCall::kReadRules && answer.error == -ENOSPC,
-                  "only the reading of rules finds no room");
-  } else {
-    Fuzz::Require(answer.status == kRefusedStatus - answer.error,
-                  "the status of a refusal tells its error value");
-    Fuzz::Require(IsDocumented(call, static_cast<int>(-answer.error)),
-                  "a call is refused with an error of its own");
-  }
-}
-
-// Where a call writes: a range and a cell of 4 bytes.
-struct Results {
-  std::uint64_t address = 0;
-  std::size_t size = 0;
-  std::uint64_t cell = 0;
-};
-
-constexpr std::uint64_t kNowhere = ~0ULL - sizeof(std::uint32_t);
-
-Results ResultsOf(PrivateCall call, const CallArguments& arguments) {
-  // No table of the small world has more entries, and no name more bytes.
-  const auto bytes = [](std::uint64_t count, std::size_t size) {
-    return static_cast<std::size_t>(std::min<std::uint64_t>(count, 128)) * size;
-  };
-  switch (call) {
-    case PrivateCall::kCreateDomain:
-      return {0, 0, arguments[2]};
-    case PrivateCall::kReadRules:
-      return {arguments[1],
-              bytes(static_cast<std::uint32_t>(arguments[2]), sizeof(ZekAccess_FileRule)),
-              kNowhere};
-    case PrivateCall::kCountRules:
-    case PrivateCall::kWorldDomain:
-      return {0, 0, arguments[1]};
-    case PrivateCall::kAddRules:
-      return {0, 0, arguments[4]};
-    case PrivateCall::kLeakedDomains:
-      return {arguments[1], bytes(arguments[2], sizeof(std::uint32_t)), arguments[0]};
-    case PrivateCall::kDomainName:
-      return {arguments[1], bytes(arguments[2], 1), kNowhere};
-    default:
-      return {0, 0, kNowhere};
-  }
-}
-
 const std::array<std::string, 8> kTexts{"appDom", "netDom", "newDom",   "",
                                         "/held",  "/new",   "relative", std::string(2100, '/')};
 
@@ -201,8 +115,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     memory.Remember();
     const PrivateAnswer answer =
         StandIn::AnswerPrivateCall(host.Host(), static_cast<long>(call), arguments);
-    RequireDocumented(call, answer);
-    const Results results = ResultsOf(call, arguments);
+    Fuzz::RequireDocumented(call, answer);
+    const Fuzz::Results results = Fuzz::ResultsOf(call, arguments);
     Fuzz::Require(memory.IsUnchangedBut(results.address, results.size, results.cell),
                   "only results are written");
     std::string now = module.Save();
