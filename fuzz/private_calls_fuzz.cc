@@ -18,6 +18,16 @@ using ZekCtl::Kernel::PrivateCall;
 using ZekCtl::Security::ZekAccess_FileRule;
 
 constexpr std::size_t kMostCalls = 16;
+
+// Two file rules, two domains whose makers have ended, and one slot that is free.
+constexpr char kState[] = R"({"format": 1, "domains": [
+  {"id": 0, "name": "rootDom", "origin": "policy"},
+  {"id": 1, "name": "appDom", "origin": "policy",
+   "fileRules": [[0, "/held", "rw"], [0, "/other", "x"]]},
+  {"id": 2, "name": "netDom", "origin": "policy"},
+  {"id": 3, "name": "goneDom", "origin": "runTime", "maker": {"pid": 812, "startTime": 1}},
+  {"id": 4, "name": "lostDom", "origin": "runTime", "maker": {"pid": 813, "startTime": 2}}]})";
+
 const std::array<std::string, 8> kTexts{"appDom", "netDom", "newDom",   "",
                                         "/held",  "/new",   "relative", std::string(2100, '/')};
 
@@ -88,6 +98,9 @@ void RequireResult(StandIn::SecurityModule& module, PrivateCall call,
   } else if (call == PrivateCall::kAddRules) {
     Fuzz::Require(valueAt(arguments[4]) == static_cast<std::uint32_t>(arguments[3]),
                   "all records are taken");
+  } else if (call == PrivateCall::kLeakedDomains) {
+    Fuzz::Require(valueAt(arguments[0]) == module.LeakedDomains().size(),
+                  "leaked ones are counted");
   } else if (call == PrivateCall::kDomainName) {
     const std::string name = module.DomainName(domain);
     Fuzz::RequireEqual(memory.Bytes(arguments[1], name.size() + 1), name + std::string(1, '\0'),
@@ -102,9 +115,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   memory.Reset();
   SecPolicyTest::MemoryHost host(Fuzz::SmallDescription());
   StandIn::SimulatedModule& module = host.Module();
-  Fuzz::Populate(module);
-  std::uint32_t taken = 0;
-  module.AddFileRules(Fuzz::kAppDomain, {{0, "/held", 0x3}, {0, "/other", 0x10}}, taken);
+  module.Restore(kState, "kernel.json");
 
   Fuzz::Input input(data, size);
   Caller caller(input, memory);
