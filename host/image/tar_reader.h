@@ -26,10 +26,10 @@ struct TarEntry {
   std::uint64_t held = 0;  // of that, what the archive holds
 };
 
-// Reads every format and compression of tar archives that the archive library knows; names are
-// bytes whatever the locale. Input that isn't such an archive, whole and without anything after its
-// end, is refused by whichever call meets it: HostError "FILE: entry "NAME": TEXT" or, between
-// entries, "FILE: at byte N: TEXT", where N counts the decompressed bytes.
+// Reads every format and compression of tar archives that the archive library reads by itself;
+// names are bytes whatever the locale. Input that isn't such an archive, whole and without anything
+// after its end, is refused by whichever call meets it: HostError "FILE: entry "NAME": TEXT" or,
+// between entries, "FILE: at byte N: TEXT", where N counts the decompressed bytes.
 class TarReader {
  public:
   // Reads from `fd`, which messages call `file`; `fd` and `budget` must outlive this object.

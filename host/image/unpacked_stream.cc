@@ -2,6 +2,7 @@
 
 #include <archive.h>
 
+#include <array>
 #include <new>
 
 namespace StandIn {
@@ -10,16 +11,43 @@ namespace {
 
 constexpr std::size_t kReadBytes = 65536;
 
+using AddFilter = int (*)(archive*);
+
+// Every compression that the archive library may read by itself. For others, and for any that it
+// was built without, it starts a program that it finds on the way, which no archive may bring
+// about.
+constexpr std::array<AddFilter, 10> kFilters{
+    ::archive_read_support_filter_bzip2, ::archive_read_support_filter_compress,
+    ::archive_read_support_filter_gzip,  ::archive_read_support_filter_lz4,
+    ::archive_read_support_filter_lzip,  ::archive_read_support_filter_lzma,
+    ::archive_read_support_filter_rpm,   ::archive_read_support_filter_uu,
+    ::archive_read_support_filter_xz,    ::archive_read_support_filter_zstd,
+};
+
+ArchivePtr NewReader() {
+  ArchivePtr reader(::archive_read_new());
+  if (!reader) {
+    throw std::bad_alloc();
+  }
+  return reader;
+}
+
+// The library warns of a filter that would be a program, but only once it is there.
+void AddOwnFilters(archive* reader) {
+  for (const AddFilter add : kFilters) {
+    if (add(NewReader().get()) == ARCHIVE_OK) {
+      add(reader);
+    }
+  }
+}
+
 }  // namespace
 
 void ArchiveCloser::operator()(archive* reader) const noexcept { ::archive_read_free(reader); }
 
 UnpackedStream::UnpackedStream(int fd, UnpackBudget& budget)
-    : fd_(fd), budget_(budget), reader_(::archive_read_new()) {
-  if (!reader_) {
-    throw std::bad_alloc();
-  }
-  ::archive_read_support_filter_all(reader_.get());
+    : fd_(fd), budget_(budget), reader_(NewReader()) {
+  AddOwnFilters(reader_.get());
   ::archive_read_support_format_raw(reader_.get());
 }
 

@@ -18,8 +18,8 @@ struct ArchiveCloser {
 };
 using ArchivePtr = std::unique_ptr<archive, ArchiveCloser>;
 
-// Reads a file through whatever compression it has, or none. Since the archive's own format isn't
-// looked at here, what follows the end of the archive can be seen too.
+// Reads a file through whatever compression it has, or none; starts no program for it. Since the
+// archive's own format isn't looked at here, what follows the end of the archive can be seen too.
 class UnpackedStream {
  public:
   // Reads from `fd`, which must outlive this object, and takes what it reads from `budget`.
