@@ -13,7 +13,7 @@
 #include "secpolicy/secpolicy.h"
 #include "tests/core/descriptors.h"
 #include "tests/core/directory_reads.h"
-#include "tests/core/failing_allocations.h"
+#include "tests/support/failing_allocations.h"
 #include "tests/host/image/temporary_directory.h"
 
 namespace SecPolicyTest {
