@@ -56,9 +56,14 @@ void DomainTable::CreateAt(DomainId id, Domain domain) {
   for (; unused_ <= id; ++unused_) {
     freed_.insert(freed_.end(), unused_);
   }
+  const auto name = ids_.emplace(domain.name, id).first;
+  try {
+    domains_.emplace(id, std::move(domain));
+  } catch (...) {
+    ids_.erase(name);
+    throw;
+  }
   freed_.erase(id);
-  ids_.emplace(domain.name, id);
-  domains_.emplace(id, std::move(domain));
 }
 
 void DomainTable::Destroy(DomainId id) {
@@ -66,9 +71,9 @@ void DomainTable::Destroy(DomainId id) {
   if (id == kRootDomain) {
     throw ModuleError(EBUSY, StrCat("the domain \"", domain.name, "\" is predefined and stays"));
   }
+  freed_.insert(id);
   ids_.erase(domain.name);
   domains_.erase(id);
-  freed_.insert(id);
 }
 
 void DomainTable::AddService(DomainId id, const std::string& service) {

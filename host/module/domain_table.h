@@ -26,6 +26,7 @@ struct Domain {
   std::vector<std::string> services;  // in the order in which they were added
 };
 
+// What throws changes nothing.
 class DomainTable {
  public:
   // `slots` (at least 1) slots, of which the first holds the root domain.

@@ -34,7 +34,6 @@ bool FileRuleTable::Rename(const std::string& oldPath, const std::string& newPat
     return !worlds.empty();
   }
   for (const WorldId world : worlds) {
-    table_.Erase({newPath, world});
     table_.Rekey({oldPath, world}, [&newPath](FileRule& rule) { rule.path = newPath; });
   }
   return !worlds.empty();

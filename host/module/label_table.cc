@@ -44,9 +44,14 @@ void LabelTable::Add(const std::string& name) {
     throw ModuleError(ENOSPC, StrCat("no id is free for the ", title_, " \"", name, "\": all ",
                                      idsAreUsedUp ? contents_.next : limit_, " are taken"));
   }
-  const LabelId id = contents_.next++;
-  contents_.defined.emplace(id, name);
-  ids_.emplace(name, id);
+  const auto place = ids_.emplace(name, contents_.next).first;
+  try {
+    contents_.defined.emplace(contents_.next, name);
+  } catch (...) {
+    ids_.erase(place);
+    throw;
+  }
+  ++contents_.next;
 }
 
 void LabelTable::Remove(const std::string& name) {
@@ -57,8 +62,8 @@ void LabelTable::Remove(const std::string& name) {
   if (found == ids_.end()) {
     return;
   }
-  contents_.defined.erase(found->second);
   contents_.removed.insert(name);
+  contents_.defined.erase(found->second);
   ids_.erase(found);
 }
 

@@ -14,12 +14,17 @@ const RuleTable* RuleBook::TableOf(RuleKind kind, DomainId domain) const {
 }
 
 void RuleBook::Set(RuleKind kind, DomainId domain, const Rule& rule) {
-  const auto replaced = domains_[domain][static_cast<std::size_t>(kind)].Set(rule);
-  if (kind == RuleKind::kTransition) {
-    ++transitionsInto_[rule.targetDomain];
-    if (replaced) {
-      --transitionsInto_[*replaced];
-    }
+  RuleTable& table = domains_[domain][static_cast<std::size_t>(kind)];
+  if (kind != RuleKind::kTransition) {
+    table.Set(rule);
+    return;
+  }
+  // Found first: once the rule is set, nothing may fail.
+  std::uint32_t& into = transitionsInto_[rule.targetDomain];
+  const auto replaced = table.Set(rule);
+  ++into;
+  if (replaced) {
+    --transitionsInto_[*replaced];
   }
 }
 
@@ -39,8 +44,8 @@ std::uint32_t RuleBook::TransitionsInto(DomainId domain) const {
 }
 
 void RuleBook::ForgetDomain(DomainId domain) {
-  for (const Rule& transition : Rules(RuleKind::kTransition, domain)) {
-    --transitionsInto_[transition.targetDomain];
+  if (const RuleTable* const transitions = TableOf(RuleKind::kTransition, domain)) {
+    transitions->ForEachTarget([this](DomainId target) { --transitionsInto_[target]; });
   }
   domains_.erase(domain);
   if (TransitionsInto(domain) == 0) {

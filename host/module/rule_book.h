@@ -22,7 +22,7 @@ class RuleBook {
 
   // How many transitions, of all domains, lead into the domain.
   [[nodiscard]] std::uint32_t TransitionsInto(DomainId domain) const;
-  // Drops the domain's rules and every domain's transitions into it.
+  // Drops the domain's rules and every domain's transitions into it. Throws nothing.
   void ForgetDomain(DomainId domain);
 
  private:

@@ -24,6 +24,12 @@ class RuleTable {
   // Drops the rules with this target; gives their number. Walks the whole table.
   std::size_t DropTarget(DomainId target);
 
+  // Hands the target of each rule to `visit`.
+  template <typename Visit>
+  void ForEachTarget(Visit visit) const {
+    for (const Stored& stored : table_.Records()) visit(stored.targetDomain);
+  }
+
   [[nodiscard]] std::size_t Size() const { return table_.Size(); }
   [[nodiscard]] std::vector<Rule> Rules() const;
 

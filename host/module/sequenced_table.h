@@ -8,7 +8,7 @@ namespace StandIn {
 
 // `Index` maps keys to places (std::list<Record>::iterator); its keys may refer into the records,
 // which stay where they are until they are erased. `KeyOf` gives a record's key. A record's key
-// must not be changed in place: take it out with Rekey.
+// must not be changed in place: use Rekey. What throws changes nothing.
 template <typename Record, typename Index, auto KeyOf>
 class SequencedTable {
  public:
@@ -30,8 +30,10 @@ class SequencedTable {
 
   // Puts a record behind the last. No record may have its key.
   void Append(Record record) {
-    records_.push_back(std::move(record));
-    index_.emplace(KeyOf(records_.back()), std::prev(records_.end()));
+    std::list<Record> appended;
+    appended.push_back(std::move(record));
+    index_.emplace(KeyOf(appended.front()), appended.begin());
+    records_.splice(records_.end(), appended);
   }
 
   // False when there is none.
@@ -59,15 +61,20 @@ class SequencedTable {
     return before - records_.size();
   }
 
-  // Lets `change` give the record at `key`, which must be there, another key, which none may have.
-  // The record keeps its place in the order.
+  // Lets `change` give the record at `key`, which must be there, another key; a record that has
+  // that one already is erased. The record keeps its place in the order.
   template <typename Change>
   void Rekey(const Key& key, Change change) {
-    const auto found = index_.find(key);
-    const auto place = found->second;
-    index_.erase(found);
-    change(*place);
-    index_.emplace(KeyOf(*place), place);
+    std::list<Record> changed(1, *index_.find(key)->second);
+    change(changed.front());
+    // From here on nothing throws.
+    auto entry = index_.extract(key);
+    Erase(KeyOf(changed.front()));
+    const auto place = std::exchange(entry.mapped(), changed.begin());
+    entry.key() = KeyOf(changed.front());
+    index_.insert(std::move(entry));
+    records_.splice(place, changed);
+    records_.erase(place);
   }
 
  private:

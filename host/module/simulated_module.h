@@ -15,7 +15,9 @@
 namespace StandIn {
 
 // Beside what SecurityModule says: slot 0 holds the predefined domain `rootDom`. A number that is
-// no label type, word list or kind of rule is refused with EINVAL.
+// no label type, word list or kind of rule is refused with EINVAL. When memory runs out, a list
+// that was to be added, removed or renamed is done in part; every other operation is not done at
+// all.
 class SimulatedModule final : public SecurityModule {
  public:
   // `processes` must outlive the module. The description is one that ReadDescription gives, or as

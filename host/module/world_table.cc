@@ -1,5 +1,7 @@
 #include "host/module/world_table.h"
 
+#include <utility>
+
 namespace StandIn {
 
 WorldTable::WorldTable(const std::map<WorldId, std::string>& described) : described_(described) {
@@ -9,15 +11,15 @@ WorldTable::WorldTable(const std::map<WorldId, std::string>& described) : descri
 }
 
 void WorldTable::Place(WorldId world, DomainId domain) {
-  if (const auto before = placed_.find(world); before != placed_.end()) {
-    --placedByDomain_[before->second];
-  }
+  // Found or made first: once the world is placed, nothing may fail.
+  std::uint32_t& inDomain = placedByDomain_[domain];
+  const auto [place, isNew] = placed_.try_emplace(world, domain);
+  if (!isNew) --placedByDomain_[std::exchange(place->second, domain)];
+  ++inDomain;
   if (const auto described = described_.find(world); described != described_.end()) {
     --describedByName_[described->second];
     described_.erase(described);
   }
-  placed_[world] = domain;
-  ++placedByDomain_[domain];
 }
 
 std::optional<DomainId> WorldTable::DomainOf(WorldId world, WorldId self,
