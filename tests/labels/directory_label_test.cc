@@ -9,6 +9,7 @@
 #include "host/image/unique_fd.h"
 #include "tests/labels/labels_fixture.h"
 #include "tests/support/file_system_answers.h"
+#include "tests/support/open_descriptors.h"
 
 namespace SecPolicyTest {
 namespace {

@@ -2,7 +2,6 @@
 
 #include <dirent.h>
 #include <dlfcn.h>
-#include <fcntl.h>
 #include <sys/stat.h>
 
 #include <cerrno>
@@ -13,8 +12,6 @@ namespace {
 
 std::map<std::string_view, unsigned char> reportedTypes;
 int fstatFailure = 0;
-
-constexpr int kMostDescriptors = 1024;
 
 template <typename Function>
 Function* NextFunction(const char* name) {
@@ -28,12 +25,6 @@ namespace SecPolicyTest {
 void ReportType(const char* name, unsigned char type) { reportedTypes[name] = type; }
 
 void FailFstat(int number) { fstatFailure = number; }
-
-int OpenDescriptors() {
-  int open = 0;
-  for (int fd = 0; fd < kMostDescriptors; ++fd) open += fcntl(fd, F_GETFD) >= 0 ? 1 : 0;
-  return open;
-}
 
 }  // namespace SecPolicyTest
 

@@ -1,4 +1,4 @@
-// What the tests' process is told by the file system, and what it has open.
+// What the tests' process is told by the file system.
 #pragma once
 
 namespace SecPolicyTest {
@@ -10,8 +10,5 @@ void ReportType(const char* name, unsigned char type);
 
 // From here on, fstat fails.
 void FailFstat(int number);
-
-// How many descriptors this process has open.
-int OpenDescriptors();
 
 }  // namespace SecPolicyTest

@@ -10,6 +10,7 @@
 namespace {
 
 int capturedTo = -1;
+SecPolicyTest::LogSink capturedBy = nullptr;
 
 std::string PriorityWord(int priority) {
   switch (priority) {
@@ -22,11 +23,17 @@ std::string PriorityWord(int priority) {
   }
 }
 
+void Keep(int priority, const char* message) {
+  if (capturedBy != nullptr) return capturedBy(priority, message);
+  dprintf(capturedTo, "%s: %s\n", PriorityWord(priority).c_str(), message);
+}
+
 }  // namespace
 
 namespace SecPolicyTest {
 
 void CaptureSystemLog(int fd) { capturedTo = fd; }
+void CaptureSystemLog(LogSink sink) { capturedBy = sink; }
 
 }  // namespace SecPolicyTest
 
@@ -35,12 +42,12 @@ void CaptureSystemLog(int fd) { capturedTo = fd; }
 extern "C" void syslog(int priority, const char* format, ...) {
   va_list arguments;
   va_start(arguments, format);
-  if (capturedTo < 0) {
+  if (capturedTo < 0 && capturedBy == nullptr) {
     vsyslog(priority, format, arguments);
   } else {
     char* text = nullptr;
     if (vasprintf(&text, format, arguments) >= 0) {
-      dprintf(capturedTo, "%s: %s\n", PriorityWord(priority).c_str(), text);
+      Keep(priority, text);
       free(text);
     }
   }

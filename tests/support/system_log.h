@@ -7,4 +7,8 @@ namespace SecPolicyTest {
 // message: "info: " or "error: " and the message; other priorities by their number.
 void CaptureSystemLog(int fd);
 
+// From here on, each message goes to `sink` instead.
+using LogSink = void (*)(int priority, const char* message);
+void CaptureSystemLog(LogSink sink);
+
 }  // namespace SecPolicyTest

@@ -1,6 +1,7 @@
 // Which tardisk carries a policy file.
 #include "tardisk/tardisk_policy.h"
 #include "tests/support/file_system_answers.h"
+#include "tests/support/open_descriptors.h"
 #include "tests/tardisk/tardisk_fixture.h"
 
 namespace SecPolicyTest {

@@ -3,6 +3,7 @@
 
 #include "tardisk/tardisk_discovery.h"
 #include "tests/support/file_system_answers.h"
+#include "tests/support/open_descriptors.h"
 #include "tests/tardisk/tardisk_fixture.h"
 
 namespace SecPolicyTest {

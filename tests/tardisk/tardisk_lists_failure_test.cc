@@ -2,6 +2,7 @@
 #include <dirent.h>
 
 #include "tests/support/file_system_answers.h"
+#include "tests/support/open_descriptors.h"
 #include "tests/tardisk/tardisk_lists_fixture.h"
 
 namespace SecPolicyTest {

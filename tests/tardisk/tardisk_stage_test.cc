@@ -1,5 +1,5 @@
 // The tardisk stage of a load, and the display of tardisk labels.
-#include "tests/support/file_system_answers.h"
+#include "tests/support/open_descriptors.h"
 #include "tests/tardisk/tardisk_fixture.h"
 
 namespace SecPolicyTest {
