@@ -228,7 +228,7 @@ Due DueAfter(const Scenario& scenario, const Baseline& baseline, const Baseline&
   switch (scenario.family) {
     case Family::kLoad:
     case Family::kStage:
-      return DueOfLoad(scenario, baseline, compared, fault, failure);
+      return DueOfLoad(scenario, baseline, compared, failure);
     case Family::kDisplay:
       return DueOfDisplay(scenario, baseline, failure);
     case Family::kCall:

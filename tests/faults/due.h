@@ -57,7 +57,7 @@ struct Failure {
 };
 
 Due DueOfLoad(const Scenario& scenario, const Baseline& baseline, const Baseline& compared,
-              const Fault& fault, const Failure& failure);
+              const Failure& failure);
 Due DueOfDisplay(const Scenario& scenario, const Baseline& baseline, const Failure& failure);
 Due DueOfCall(const Scenario& scenario, const Baseline& baseline, const Fault& fault,
               const Failure& failure);

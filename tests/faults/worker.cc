@@ -4,12 +4,11 @@
 
 #include <algorithm>
 #include <cstdio>
-#include <memory>
 
 #include "host/image/session.h"
 #include "host/module/description_json.h"
 #include "tests/faults/call_doors.h"
-#include "tests/faults/check.h"
+#include "tests/faults/trial.h"
 
 #if defined(__SANITIZE_ADDRESS__)
 #include <sanitizer/lsan_interface.h>
@@ -48,75 +47,6 @@ bool IsRepeated(const Scenario& scenario, std::uint64_t tried, Form form) {
   return tried % stride == 0;
 }
 
-// ---- One fault
-// -----------------------------------------------------------------------------------
-
-class Campaigner {
- public:
-  Campaigner(const Scenario& scenario, Runner& runner)
-      : scenario_(scenario), runner_(runner), baseline_(runner.Run(scenario, {}), scenario.first) {}
-
-  [[nodiscard]] std::uint64_t Possible(FaultKind kind) const {
-    return baseline_.run.passed[static_cast<std::size_t>(InfoOf(kind).door)];
-  }
-
-  [[nodiscard]] std::vector<std::string> UndisturbedFindings() const {
-    return baseline_.run.findings;
-  }
-
-  std::vector<std::string> Try(const Fault& fault, bool repeat) {
-    const bool mayTerminate = MayTerminate(scenario_, baseline_, fault);
-    const Comparison comparison = ComparisonFor(scenario_, baseline_, fault);
-    RunOptions options{.inChild = mayTerminate, .stateless = true};
-    std::unique_ptr<Baseline> compared;
-    if (comparison.needed) {
-      options.fault = comparison.gently.gently ? &comparison.gently : nullptr;
-      options.missing = &comparison.missing;
-      compared = std::make_unique<Baseline>(runner_.Run(scenario_, options), scenario_.first);
-    }
-    const Due due = DueAfter(scenario_, baseline_, compared ? *compared : baseline_, fault);
-    const RunResult& like =
-        fault.kind == FaultKind::kReadDirectory || fault.kind == FaultKind::kRead ? compared->run
-                                                                                  : baseline_.run;
-    // To look at the example's state takes longer than to make it.
-    const bool stateless = !repeat && scenario_.host == HostKind::kExample;
-    const RunOptions disturbed{.fault = &fault, .inChild = mayTerminate, .stateless = stateless};
-    std::vector<std::string> findings =
-        Differences(scenario_, like, due, runner_.Run(scenario_, disturbed));
-    if (repeat) Repeat(fault, mayTerminate, findings);
-    return findings;
-  }
-
- private:
-  void Repeat(const Fault& fault, bool mayTerminate, std::vector<std::string>& findings) {
-    Append(DifferencesFromUndisturbed(baseline_.run, runner_.Run(scenario_, {})), findings);
-    if (mayTerminate || !LeavesSame(fault)) return;
-    const RunResult run = runner_.Run(scenario_, {.fault = &fault, .again = true});
-    Append(DifferencesWhenRepeated(baseline_.run, run), findings);
-  }
-
-  // Whether a repetition on the state that the fault left leads to the same state. Objects, and
-  // domains, that come later than others get other ids; so do a tardisk's rules another order; and
-  // of a policy with mistakes, a fault can let by what a mistake would have kept out.
-  [[nodiscard]] bool LeavesSame(const Fault& fault) const {
-    const bool isGood = baseline_.run.ending == Ending::kReturned;
-    if (scenario_.family != Family::kLoad || !isGood) return false;
-    if (fault.kind == FaultKind::kReadDirectory || fault.kind == FaultKind::kRead) return false;
-    const std::size_t event = baseline_.EventOf(fault);
-    if (event == Baseline::kNowhere) return true;
-    const Stage stage = InfoOf(baseline_.phases[event]).stage;
-    return stage != Stage::kObjects && stage != Stage::kTardisks;
-  }
-
-  static void Append(const std::vector<std::string>& from, std::vector<std::string>& to) {
-    to.insert(to.end(), from.begin(), from.end());
-  }
-
-  const Scenario& scenario_;
-  Runner& runner_;
-  const Baseline baseline_;
-};
-
 void Print(const Scenario& scenario, std::string_view fault, std::uint64_t number,
            const std::vector<std::string>& findings) {
   std::string text = "unexplained: --scenario " + scenario.name + " --fault " + std::string(fault) +
@@ -148,39 +78,39 @@ class Worker {
   void TryScenario(const Scenario& scenario) {
     // What is made on first use is no leak.
     runner_.Run(scenario, {});
-    Campaigner campaigner(scenario, runner_);
-    if (!campaigner.UndisturbedFindings().empty()) {
-      Print(scenario, "none", 0, campaigner.UndisturbedFindings());
+    Trial trial(scenario, runner_);
+    if (!trial.UndisturbedFindings().empty()) {
+      Print(scenario, "none", 0, trial.UndisturbedFindings());
       ++board_.cells[board_.scenario][0].score.unexplained;
     }
     for (; board_.fault < kFaults.size(); ++board_.fault, board_.number = 0) {
       if (IsChosen(task_.options.faults, kFaults[board_.fault].name)) {
-        TryKind(scenario, campaigner, static_cast<FaultKind>(board_.fault));
+        TryKind(scenario, trial, static_cast<FaultKind>(board_.fault));
       }
     }
   }
 
-  void TryKind(const Scenario& scenario, Campaigner& campaigner, FaultKind kind) {
+  void TryKind(const Scenario& scenario, Trial& trial, FaultKind kind) {
     Cell& cell = board_.cells[board_.scenario][board_.fault];
-    cell.possible = campaigner.Possible(kind);
+    cell.possible = trial.Possible(kind);
     cell.stride = task_.options.stride != 0
                       ? task_.options.stride
                       : StrideFor(cell.possible, MostFaults(scenario, kind, task_.options.form));
     if (task_.options.only) {
       board_.number = *task_.options.only;
-      return TryOne(scenario, campaigner, {kind, board_.number}, cell, true);
+      return TryOne(scenario, trial, {kind, board_.number}, cell, true);
     }
     for (; board_.number < cell.possible; board_.number += cell.stride) {
       const bool repeat = IsRepeated(scenario, board_.number / cell.stride, task_.options.form);
-      TryOne(scenario, campaigner, {kind, board_.number}, cell, repeat);
+      TryOne(scenario, trial, {kind, board_.number}, cell, repeat);
     }
     LookForLeaks(scenario, cell);
   }
 
-  static void TryOne(const Scenario& scenario, Campaigner& campaigner, const Fault& fault,
-                     Cell& cell, bool repeat) {
+  static void TryOne(const Scenario& scenario, Trial& trial, const Fault& fault, Cell& cell,
+                     bool repeat) {
     ++cell.score.injected;
-    const std::vector<std::string> findings = campaigner.Try(fault, repeat);
+    const std::vector<std::string> findings = trial.Try(fault, repeat);
     if (findings.empty()) return;
     ++cell.score.unexplained;
     Print(scenario, InfoOf(fault.kind).name, fault.number, findings);
