@@ -109,22 +109,23 @@ long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments)
 
 long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
   const auto& [path, name, value, size, flags, unused] = arguments;
-  if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_setxattr, arguments.data());
-  return AsResult([&, value = value, size = size, flags = flags, path = path]() -> long {
-    const auto labelledPath = LabelledPath(host, path);
-    CheckFlags(flags, labelledPath.has_value());
-    LabelId label = 0;
-    if (size != sizeof label) throw BadArgument{EINVAL};
-    ReadMemory(value, &label, sizeof label);
-    host.module.SetFileLabel(*labelledPath, label);
-    return 0;
-  });
+  return AsResult(
+      [&, path = path, name = name, value = value, size = size, flags = flags]() -> long {
+        if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_setxattr, arguments.data());
+        const auto labelledPath = LabelledPath(host, path);
+        CheckFlags(flags, labelledPath.has_value());
+        LabelId label = 0;
+        if (size != sizeof label) throw BadArgument{EINVAL};
+        ReadMemory(value, &label, sizeof label);
+        host.module.SetFileLabel(*labelledPath, label);
+        return 0;
+      });
 }
 
 long AnswerGetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
   const auto& [path, name, value, size, unused1, unused2] = arguments;
-  if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
-  return AsResult([&, value = value, size = size, path = path]() -> long {
+  return AsResult([&, path = path, name = name, value = value, size = size]() -> long {
+    if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
     const auto labelledPath = LabelledPath(host, path);
     if (!labelledPath) throw BadArgument{ENODATA};
     const LabelId label = host.module.FileLabel(*labelledPath);

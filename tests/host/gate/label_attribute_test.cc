@@ -3,9 +3,11 @@
 #include <sys/xattr.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <filesystem>
 
 #include "tests/host/gate/gate_fixture.h"
+#include "tests/support/counted_memory.h"
 
 namespace StandIn {
 namespace {
@@ -47,6 +49,21 @@ TEST_F(LabelAttributeTest, EveryFileOfTheImageCarriesALabelFromTheStart) {
     for (const char* path : {"/", "/etc", "/etc/motd", "/etc/link", "/etc/fifo", "/tardisks",
                              "/tardisks/base.tar", "etc/../etc/motd"})
       EXPECT_EQ(Get(path), std::to_string(kDefault)) << path;
+  });
+}
+
+TEST_F(LabelAttributeTest, OtherAttributeForWhoseNameThereIsNoMemoryIsAnError) {
+  InHost([] {
+    constexpr char kOther[] = "user.a-name-that-is-longer-than-others";
+    SecPolicyTest::FailAllocation(0);
+    const int set = setxattr("/etc/motd", kOther, "x", 1, 0);
+    const int reason = set == 0 ? 0 : errno;
+    SecPolicyTest::FailAllocation(0);
+    const ssize_t got = getxattr("/etc/motd", kOther, nullptr, 0);
+    const int otherReason = got >= 0 ? 0 : errno;
+    SecPolicyTest::FailNoAllocation();
+    EXPECT_EQ(reason, ENOMEM);
+    EXPECT_EQ(otherReason, ENOMEM);
   });
 }
 
