@@ -62,6 +62,10 @@ Due DueOfDisplay(const Scenario& scenario, const Baseline& baseline, const Failu
 Due DueOfCall(const Scenario& scenario, const Baseline& baseline, const Fault& fault,
               const Failure& failure);
 
+// What fails when the fault befalls the event.
+Failure FailureAt(const Scenario& scenario, const Baseline& baseline, std::size_t event,
+                  const Fault& fault);
+
 // The log up to an event, as it was.
 std::vector<DueLine> LogUpTo(const Baseline& baseline, std::size_t event);
 // The operations among the first `count` events and, if it is open then, what closes the interface.
