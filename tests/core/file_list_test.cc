@@ -13,8 +13,8 @@
 #include "secpolicy/secpolicy.h"
 #include "tests/core/descriptors.h"
 #include "tests/core/directory_reads.h"
-#include "tests/support/failing_allocations.h"
 #include "tests/host/image/temporary_directory.h"
+#include "tests/support/failing_allocations.h"
 
 namespace SecPolicyTest {
 namespace {

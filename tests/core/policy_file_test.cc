@@ -5,9 +5,9 @@
 
 #include "secpolicy/secpolicy.h"
 #include "tests/core/descriptors.h"
-#include "tests/support/failing_allocations.h"
 #include "tests/core/words.h"
 #include "tests/host/image/temporary_directory.h"
+#include "tests/support/failing_allocations.h"
 
 namespace SecPolicyTest {
 namespace {
