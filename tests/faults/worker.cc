@@ -145,9 +145,6 @@ StandIn::SessionOptions OptionsHere() {
 #if defined(__SANITIZE_ADDRESS__)
   options.visible.push_back("/proc");  // the search for leaks reads it
 #endif
-#if defined(SECPOLICY_COVERAGE_DIR)
-  options.visible.push_back(SECPOLICY_COVERAGE_DIR);
-#endif
   return options;
 }
 
