@@ -9,19 +9,9 @@
 #include "fuzz/support/small_world.h"
 #include "tests/support/captured.h"
 #include "tests/support/memory_file.h"
+#include "tests/support/refusal.h"
 
 namespace {
-
-using Tavon::Lib::TavonException;
-
-// The text of the TavonException that `action` throws; nothing for none. Others pass through.
-template <typename Action>
-std::string RefusalOf(const Action& action) try {
-  action();
-  return "";
-} catch (const TavonException& failure) {
-  return failure.what();
-}
 
 std::string PrintedBy(SecPolicy::DomainPolicy& policy) {
   const SecPolicyTest::Captured out(std::cout);
@@ -53,12 +43,13 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   SecPolicy::ZekAccessInterfaceImpl iface;
   SecPolicy::DomainPolicy policy("appDom", Fuzz::kAppDomain);
   policy.SetPolicyFile(file.Path());
-  const std::string refusal = RefusalOf([&] { policy.ParsePolicy(iface); });
+  const std::string refusal = SecPolicyTest::RefusalOf([&] { policy.ParsePolicy(iface); });
   const Fuzz::PlainOutcome expected = Fuzz::ReadDomainPlainly("appDom", Fuzz::PlainLinesOf(bytes));
   Fuzz::RequireError(refusal, expected);
   Fuzz::RequireEqual(PrintedBy(policy), Fuzz::PrintedPlainly(expected.rules),
                      "the lines before the first bad one are kept");
-  RequireConstraintError(RefusalOf([&] { policy.CheckPolicyConstraints(iface); }), expected.rules);
+  RequireConstraintError(SecPolicyTest::RefusalOf([&] { policy.CheckPolicyConstraints(iface); }),
+                         expected.rules);
   Fuzz::Require(host.Module().Save() == before, "parsing and checking change nothing");
   return 0;
 }

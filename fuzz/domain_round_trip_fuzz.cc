@@ -8,26 +8,15 @@
 #include "fuzz/support/require.h"
 #include "fuzz/support/small_world.h"
 #include "host/gate/gate.h"
-#include "host/module/module_error.h"
 #include "tests/support/captured.h"
 #include "tests/support/memory_file.h"
+#include "tests/support/refusal.h"
 #include "tests/support/system_log.h"
+#include "tests/support/unresolved_paths.h"
 
 namespace {
 
 using StandIn::RuleKind;
-using Tavon::Lib::TavonException;
-
-// Paths are kept as they are written, whatever this machine has.
-class UnresolvedPaths final : public StandIn::OperationHook {
- public:
-  void Around(const StandIn::OperationCall& call, const StandIn::Callable<void>& proceed) override {
-    if (call.operation == StandIn::Operation::kResolvePath) {
-      throw StandIn::ModuleError(ENOENT, "no path is resolved");
-    }
-    proceed();
-  }
-};
 
 // A kernel of the small world, to which a domain's file is handed.
 class Kernel {
@@ -38,18 +27,19 @@ class Kernel {
   }
 
   // What parsing, checking and setting are refused with, and not gone on with; nothing for none.
-  std::string Load(const std::string& text) try {
+  std::string Load(const std::string& text) {
     static SecPolicyTest::MemoryFile file;
     file.Write(text);
     SecPolicy::ZekAccessInterfaceImpl iface;
     SecPolicy::DomainPolicy policy("appDom", Fuzz::kAppDomain);
     policy.SetPolicyFile(file.Path());
-    const std::string refusal = Parse(policy, iface);
-    policy.CheckPolicyConstraints(iface);
-    policy.SetPolicy(iface);
-    return refusal;
-  } catch (const TavonException& failure) {
-    return failure.what();
+    // The rules before a bad line are set all the same.
+    const std::string badLine = SecPolicyTest::RefusalOf([&] { policy.ParsePolicy(iface); });
+    const std::string refusal = SecPolicyTest::RefusalOf([&] {
+      policy.CheckPolicyConstraints(iface);
+      policy.SetPolicy(iface);
+    });
+    return refusal.empty() ? badLine : refusal;
   }
 
   std::string Printed() {
@@ -83,16 +73,7 @@ class Kernel {
   std::string Save() { return host_.Module().Save(); }
 
  private:
-  // The rules before a bad line are set all the same.
-  static std::string Parse(SecPolicy::DomainPolicy& policy,
-                           SecPolicy::ZekAccessInterfaceImpl& iface) try {
-    policy.ParsePolicy(iface);
-    return "";
-  } catch (const TavonException& failure) {
-    return failure.what();
-  }
-
-  UnresolvedPaths paths_;
+  SecPolicyTest::UnresolvedPaths paths_;
   SecPolicyTest::MemoryHost host_;
 };
 

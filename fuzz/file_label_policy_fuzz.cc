@@ -10,11 +10,10 @@
 #include "labels/file_label_policy.h"
 #include "tests/support/captured.h"
 #include "tests/support/memory_file.h"
+#include "tests/support/refusal.h"
 #include "tests/support/system_log.h"
 
 namespace {
-
-using Tavon::Lib::TavonException;
 
 // What is logged when no mapping can be applied.
 std::string ExpectedErrors(const std::string& file, const std::vector<Fuzz::PlainRule>& rules) {
@@ -30,12 +29,7 @@ std::string ExpectedErrors(const std::string& file, const std::vector<Fuzz::Plai
 std::string ErrorsOf(SecPolicy::FileLabelPolicy& policy, SecPolicy::ZekAccessInterfaceImpl& iface,
                      bool isToFail) {
   const SecPolicyTest::Captured errors(std::cerr);
-  std::string refusal;
-  try {
-    policy.SetFileLabels(iface);
-  } catch (const TavonException& failure) {
-    refusal = failure.what();
-  }
+  const std::string refusal = SecPolicyTest::RefusalOf([&] { policy.SetFileLabels(iface); });
   Fuzz::RequireEqual(refusal, isToFail ? "There was a failure in setting file labels" : "",
                      "a failed mapping fails the whole");
   return errors.Text();
@@ -57,12 +51,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
 
   SecPolicy::ZekAccessInterfaceImpl iface;
   SecPolicy::FileLabelPolicy policy;
-  std::string refusal;
-  try {
-    policy.ParsePolicy(file.Path(), iface);
-  } catch (const TavonException& failure) {
-    refusal = failure.what();
-  }
+  const std::string refusal =
+      SecPolicyTest::RefusalOf([&] { policy.ParsePolicy(file.Path(), iface); });
   const Fuzz::PlainOutcome expected =
       Fuzz::ReadFileLabelsPlainly(file.Path(), Fuzz::PlainLinesOf(bytes));
   Fuzz::RequireError(refusal, expected);

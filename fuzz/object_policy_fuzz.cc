@@ -8,11 +8,10 @@
 #include "fuzz/support/small_world.h"
 #include "labels/object_policy.h"
 #include "tests/support/memory_file.h"
+#include "tests/support/refusal.h"
 #include "tests/support/system_log.h"
 
 namespace {
-
-using Tavon::Lib::TavonException;
 
 constexpr std::size_t kLongestName = 127;
 constexpr std::size_t kMostObjects = 12;  // as the small world says
@@ -46,12 +45,6 @@ std::vector<std::string> ObjectsOf(StandIn::SecurityModule& module) {
   return objects;
 }
 
-void SetObjects(SecPolicy::ObjectPolicy& policy, SecPolicy::ZekAccessInterfaceImpl& iface) try {
-  policy.SetObjects(iface);
-} catch (const TavonException&) {
-  // A name that will not do; what was done until then is compared.
-}
-
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
@@ -66,16 +59,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
 
   SecPolicy::ZekAccessInterfaceImpl iface;
   SecPolicy::ObjectPolicy policy;
-  std::string refusal;
-  try {
-    policy.ParsePolicy(file.Path());
-  } catch (const TavonException& failure) {
-    refusal = failure.what();
-  }
+  const std::string refusal = SecPolicyTest::RefusalOf([&] { policy.ParsePolicy(file.Path()); });
   const Fuzz::PlainOutcome expected =
       Fuzz::ReadObjectsPlainly(file.Path(), Fuzz::PlainLinesOf(bytes));
   Fuzz::RequireError(refusal, expected);
-  SetObjects(policy, iface);
+  // A name that will not do is refused; what was done until then is compared.
+  static_cast<void>(SecPolicyTest::RefusalOf([&] { policy.SetObjects(iface); }));
   Fuzz::RequireEqual(Fuzz::Joined(ObjectsOf(host.Module()), "\n"),
                      Fuzz::Joined(ExpectedObjects(expected.rules), "\n"),
                      "the objects are those of the file");

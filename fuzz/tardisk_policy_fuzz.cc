@@ -8,18 +8,9 @@
 #include "fuzz/support/scratch_directory.h"
 #include "fuzz/support/small_world.h"
 #include "tardisk/tardisk_policy.h"
+#include "tests/support/refusal.h"
 
 namespace {
-
-using Tavon::Lib::TavonException;
-
-template <typename Action>
-std::string RefusalOf(const Action& action) try {
-  action();
-  return "";
-} catch (const TavonException& failure) {
-  return failure.what();
-}
 
 // What installing is refused with when labels cannot be looked up.
 std::string ExpectedRefusal(const std::string& file, const std::vector<Fuzz::PlainRule>& rules) {
@@ -43,10 +34,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
 
   SecPolicy::ZekAccessInterfaceImpl iface;
   SecPolicy::TardiskPolicy policy(file);
-  const std::string refusal = RefusalOf([&] { policy.ParsePolicy(iface); });
+  const std::string refusal = SecPolicyTest::RefusalOf([&] { policy.ParsePolicy(iface); });
   const Fuzz::PlainOutcome expected = Fuzz::ReadTardiskPlainly(file, Fuzz::PlainLinesOf(bytes));
   Fuzz::RequireError(refusal, expected);
-  Fuzz::RequireEqual(RefusalOf([&] { policy.SetPolicy(iface); }),
+  Fuzz::RequireEqual(SecPolicyTest::RefusalOf([&] { policy.SetPolicy(iface); }),
                      ExpectedRefusal(file, expected.rules), "the rule that was kept is installed");
   return 0;
 }

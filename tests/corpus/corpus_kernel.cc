@@ -7,11 +7,12 @@
 
 #include "domain/domain_policy.h"
 #include "host/module/description_json.h"
-#include "host/module/module_error.h"
 #include "labels/object_policy.h"
 #include "tests/corpus/corpus_texts.h"
 #include "tests/corpus/word_table.h"
+#include "tests/support/refusal.h"
 #include "tests/support/system_log.h"
+#include "tests/support/unresolved_paths.h"
 
 namespace SecPolicyTest {
 
@@ -22,17 +23,6 @@ using StandIn::RuleKind;
 namespace {
 
 constexpr unsigned int kAppDomain = 1;
-
-// Paths of rules are kept as they are written, whatever this machine has.
-class UnresolvedPaths final : public StandIn::OperationHook {
- public:
-  void Around(const StandIn::OperationCall& call, const StandIn::Callable<void>& proceed) override {
-    if (call.operation == StandIn::Operation::kResolvePath) {
-      throw StandIn::ModuleError(ENOENT, "no path is resolved");
-    }
-    proceed();
-  }
-};
 
 UnresolvedPaths unresolvedPaths;
 

@@ -13,6 +13,7 @@
 #include "tests/corpus/corpus_kernel.h"
 #include "tests/corpus/corpus_texts.h"
 #include "tests/support/captured.h"
+#include "tests/support/refusal.h"
 
 namespace SecPolicyTest {
 

@@ -4,21 +4,11 @@
 #include <string>
 
 #include "host/module/rule.h"
-#include "platform/tavon_exception.h"
 
 namespace SecPolicyTest {
 
 // What the held file carries before each file of labels; near to no word.
 inline const std::string kFirstLabel(60, '~');
-
-// The text of the TavonException that `action` throws; empty for none.
-template <typename Action>
-std::string RefusalOf(const Action& action) try {
-  action();
-  return "";
-} catch (const Tavon::Lib::TavonException& failure) {
-  return failure.what();
-}
 
 // `text` with the mark of a file's path instead of `path`.
 std::string WithFileMark(std::string text, const std::string& path);

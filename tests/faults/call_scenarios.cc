@@ -130,6 +130,43 @@ void AddLabelCalls(std::vector<Scenario>& all) {
                      })));
 }
 
+// What a call throws when nothing fails.
+Text TextOf(const std::function<void()>& call) try {
+  call();
+  return {};
+} catch (const Tavon::Lib::TavonException& failure) {
+  return failure.what();
+}
+
+void AddDiagnosticCalls(std::vector<Scenario>& all) {
+  static constexpr char kMessage[] = "a message that no short string holds";
+  all.push_back(Call("info", Doing([] { SecPolicy::SecpolicyInfo(kMessage); })));
+  all.push_back(Call("error", Doing([] { SecPolicy::SecpolicyError(kMessage); })));
+  all.push_back(Call("header", Doing([] { SecPolicy::DisplayHeader(kMessage, "and another"); })));
+  all.push_back(Call("rule-size-error", [] { return TextOf(SecPolicy::RuleSizeError); }));
+  all.push_back(Call("domain-parse-error", [] {
+    return TextOf([] { SecPolicy::ThrowDomainParseError(7, "appDom", kMessage); });
+  }));
+  all.push_back(Call("domain-set-error", [] {
+    return TextOf([] { SecPolicy::ThrowDomainSetError(7, "appDom", kMessage); });
+  }));
+  all.push_back(Call("grant-word", [] {
+    Text word = "a-word-that-is-no-decision";
+    return TextOf([&] { SecPolicy::IsGrant(word); });
+  }));
+  const auto type = SecPolicy::ZekAccessLabelType::kObjectLabel;
+  all.push_back(Call("print-obsolete-labels", Doing([type] {
+                       SecPolicy::PrintObsoleteLabels({"apps", "a-label-with-a-long-name"}, type);
+                     })));
+  all.push_back(Call("print-invalid-labels", Doing([type] {
+                       SecPolicy::PrintInvalidLabels({"apps", "a-label-with-a-long-name"}, type);
+                     })));
+  all.push_back(Call("well-known-ids", [] {
+    return std::to_string(SecPolicy::GetGlobalVMDomain() + SecPolicy::GetIOFilterDomain() +
+                          SecPolicy::GetDefaultTardiskDomain());
+  }));
+}
+
 }  // namespace
 
 void AddCallScenarios(std::vector<Scenario>& all) {
@@ -137,6 +174,7 @@ void AddCallScenarios(std::vector<Scenario>& all) {
   AddFileRuleCalls(all);
   AddReaderCalls(all);
   AddLabelCalls(all);
+  AddDiagnosticCalls(all);
 }
 
 }  // namespace SecPolicyFaults
