@@ -2,6 +2,7 @@
 #include <sys/xattr.h>
 
 #include "tests/labels/labels_fixture.h"
+#include "tests/support/scripted_kernel.h"
 
 namespace SecPolicyTest {
 namespace {
@@ -138,6 +139,17 @@ TEST_F(FileLabelTest, IdThatNoLabelHasAnyMoreIsTheKernelsFailure) {
   Set("/opt/file", "mail");
   RunWithInterface([](auto& iface) { iface.RemoveLabels({"mail"}, kObjectLabel); });
   EXPECT_EQ(Get("/opt/file").error, "no object label has the id 4");
+}
+
+TEST_F(FileLabelTest, AttributeWithoutBytesIsTheIdZero) {
+  const Outcome outcome = RunWithInterface([](auto& iface) {
+    // An ordinary call leaves the second result register as it was.
+    const ScriptedKernel kernel([](const SeenCall& call) {
+      return KernelAnswer{0, static_cast<long>(call.arguments[2])};
+    });
+    return SecPolicy::GetFileLabel("/opt/file", iface);
+  });
+  EXPECT_EQ(outcome.error, "no object label has the id 0");
 }
 
 TEST_F(FileLabelTest, NothingIsLoggedHere) {
