@@ -154,12 +154,12 @@ void AddDiagnosticCalls(std::vector<Scenario>& all) {
     Text word = "a-word-that-is-no-decision";
     return TextOf([&] { SecPolicy::IsGrant(word); });
   }));
-  const auto type = SecPolicy::ZekAccessLabelType::kObjectLabel;
-  all.push_back(Call("print-obsolete-labels", Doing([type] {
-                       SecPolicy::PrintObsoleteLabels({"apps", "a-label-with-a-long-name"}, type);
+  constexpr auto kType = SecPolicy::ZekAccessLabelType::kObjectLabel;
+  all.push_back(Call("print-obsolete-labels", Doing([] {
+                       SecPolicy::PrintObsoleteLabels({"apps", "a-label-with-a-long-name"}, kType);
                      })));
-  all.push_back(Call("print-invalid-labels", Doing([type] {
-                       SecPolicy::PrintInvalidLabels({"apps", "a-label-with-a-long-name"}, type);
+  all.push_back(Call("print-invalid-labels", Doing([] {
+                       SecPolicy::PrintInvalidLabels({"apps", "a-label-with-a-long-name"}, kType);
                      })));
   all.push_back(Call("well-known-ids", [] {
     return std::to_string(SecPolicy::GetGlobalVMDomain() + SecPolicy::GetIOFilterDomain() +

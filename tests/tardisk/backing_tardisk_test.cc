@@ -1,5 +1,8 @@
 // Which tardisk carries a policy file.
 #include "tardisk/tardisk_policy.h"
+
+#include <unistd.h>
+
 #include "tests/support/file_system_answers.h"
 #include "tests/support/open_descriptors.h"
 #include "tests/tardisk/tardisk_fixture.h"
@@ -48,6 +51,15 @@ TEST_F(BackingTardiskTest, IsAskedForTheFileOfWhateverName) {
   Tardisk("base").File("etc/plain", "").Symlink("etc/link", "plain");
   EXPECT_EQ(Backing("/etc/plain").value, "/tardisks/base");
   EXPECT_EQ(Backing("/etc/link").value, "/tardisks/base");
+}
+
+TEST_F(BackingTardiskTest, ProgramMayHaveClosedItsStandardInput) {
+  Tardisk("base").File("etc/plain", "");
+  const Outcome outcome = Run([] {
+    close(STDIN_FILENO);  // so that the file is opened as descriptor 0
+    return TardiskPolicy("/etc/plain").GetBackingTardiskPath();
+  });
+  EXPECT_EQ(outcome.value, "/tardisks/base") << outcome.error;
 }
 
 TEST_F(BackingTardiskTest, IsEmptyForAFileThatNoTardiskBrought) {
