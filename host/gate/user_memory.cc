@@ -44,6 +44,7 @@ void ProbeWritable(std::uint64_t address, std::size_t size) {
 
 std::string ReadString(std::uint64_t address, std::size_t room) {
   std::string text;
+  text.reserve(room);  // memory runs out here or nowhere, wherever the string lies in its pages
   std::array<char, kPage> chunk;
   while (text.size() < room) {
     // Up to the end of a page: the string may end just before memory that cannot be read.

@@ -13,9 +13,11 @@
 // The instrumentation's own. That the first is defined here leaves it to this file when the second
 // is called, which has the counts written at the end: after what is registered later is done.
 extern "C" {
+// NOLINTBEGIN(bugprone-reserved-identifier): they are not this file's names to choose
 int __llvm_profile_runtime = 0;
 void __llvm_profile_initialize(void);
 int __llvm_profile_write_file(void);
+// NOLINTEND(bugprone-reserved-identifier)
 }
 
 namespace {
