@@ -50,10 +50,11 @@ Session::Session(HostDirectory host, const SessionOptions& options)
       observed_(module_, point_),
       files_(FilesOf(host_, file_)),
       attached_{observed_, point_, module_, files_} {
-  RefreshUnderLock(keeper_, file_);
+  const bool isKept = options.kernel == SessionOptions::Kernel::kKept;
+  if (isKept) RefreshUnderLock(keeper_, file_);
   for (const Fault& fault : options.faults) faults_.Add(fault);
   // The lock is held around everything; a fault is traced as the refusal that it stands for.
-  point_.Add(keeper_);
+  if (isKept) point_.Add(keeper_);
   point_.Add(trace_);
   point_.Add(faults_);
   const UniqueFd root = OpenDirectory(host_.Ref(), kRootDirectory);

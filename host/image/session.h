@@ -23,6 +23,9 @@ struct SessionOptions {
   std::vector<std::string> visible;
   TraceLog::Sink trace;
   std::vector<Fault> faults;
+  // Whether the kernel is the host's, or one that has just been started and is forgotten with the
+  // process: what is loaded into it changes nothing on disk.
+  enum class Kernel { kKept, kScratch } kernel = Kernel::kKept;
 };
 
 // Turns this process into a process of the host: its root file system is the host's, its kernel has
@@ -31,7 +34,7 @@ struct SessionOptions {
 // session a process.
 //
 // Each operation on the module is kept before it reports success (see state_keeper.h), unless a
-// batch keeps many at once.
+// batch keeps many at once, or the kernel is a scratch one.
 class Session {
  public:
   // Throws HostError when the host is damaged, has not been assembled, or cannot be entered here.
@@ -47,6 +50,8 @@ class Session {
 
   // The module behind all hooks, as the platform's libraries use it.
   [[nodiscard]] SecurityModule& Module() { return observed_; }
+  // What the module holds now, in the form of kernel.json.
+  [[nodiscard]] std::string SavedState() const { return module_.Save(); }
 
  private:
   HostDirectory host_;

@@ -52,6 +52,10 @@ void AddHostOption(CLI::App& verb, std::string& dir) {
       ->type_name("DIR");
 }
 
+void AddJsonOption(CLI::App& verb, bool& isJson) {
+  verb.add_flag("--json", isJson, "Print JSON, for programs");
+}
+
 HostDirectory OpenHost(const std::string& dir) {
   return dir.empty() ? OpenOwnHost() : HostDirectory(dir);
 }

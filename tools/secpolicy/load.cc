@@ -10,11 +10,11 @@
 
 #include "host/image/session.h"
 #include "secpolicy/secpolicy.h"
-#include "tools/secpolicy/child_process.h"
+#include "tools/policy/child_process.h"
+#include "tools/policy/output.h"
+#include "tools/policy/policy_path.h"
+#include "tools/policy/progress_filter.h"
 #include "tools/secpolicy/host_option.h"
-#include "tools/secpolicy/output.h"
-#include "tools/secpolicy/policy_path.h"
-#include "tools/secpolicy/progress_filter.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {

@@ -1,7 +1,7 @@
 #include <exception>
 #include <iostream>
 
-#include "tools/secpolicy/output.h"
+#include "tools/policy/output.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
@@ -16,6 +16,7 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
       "3 the load was terminated because a domain that the host needs is missing.");
   AddLoad(app, status);
   AddShow(app, status);
+  AddDigest(app, status);
   CLI::App* host = app.add_subcommand("host", "Make, assemble and inspect host directories");
   host->require_subcommand(1);
   AddHostInit(*host, status);

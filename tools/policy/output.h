@@ -1,12 +1,17 @@
 // What the command tells its user.
 #pragma once
 
+#include <nlohmann/json.hpp>
 #include <string>
 
 namespace SecPolicyTool {
 
 // "Error: " + text on standard error: the form in which the library reports, too.
 void ReportError(const std::string& text);
+
+// Prints `content` to standard output, indented. Bytes that are not UTF-8, which JSON cannot hold,
+// are replaced by U+FFFD.
+void PrintJson(const nlohmann::json& content);
 
 // Flushes standard output; throws std::runtime_error when something of it could not be written, so
 // that a full disk does not pass for success.

@@ -1,4 +1,4 @@
-#include "tools/secpolicy/child_process.h"
+#include "tools/policy/child_process.h"
 
 #include <fcntl.h>
 #include <sys/wait.h>
@@ -12,8 +12,8 @@
 #include <system_error>
 
 #include "host/image/unique_fd.h"
-#include "tools/secpolicy/output.h"
-#include "tools/secpolicy/verbs.h"
+#include "tools/policy/exit_status.h"
+#include "tools/policy/output.h"
 
 namespace SecPolicyTool {
 

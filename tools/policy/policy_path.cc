@@ -1,4 +1,4 @@
-#include "tools/secpolicy/policy_path.h"
+#include "tools/policy/policy_path.h"
 
 #include <filesystem>
 

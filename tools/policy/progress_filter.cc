@@ -1,4 +1,4 @@
-#include "tools/secpolicy/progress_filter.h"
+#include "tools/policy/progress_filter.h"
 
 #include <syslog.h>
 

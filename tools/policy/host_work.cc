@@ -1,0 +1,125 @@
+#include "tools/policy/host_work.h"
+
+#include <sys/mman.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstring>
+#include <exception>
+#include <stdexcept>
+#include <system_error>
+
+#include "host/image/file_io.h"
+#include "tools/policy/child_process.h"
+#include "tools/policy/exit_status.h"
+
+namespace SecPolicyTool {
+
+namespace {
+
+using nlohmann::json;
+using StandIn::Session;
+using StandIn::UniqueFd;
+
+// A file without a name, in which the child leaves what it found. CBOR, since its strings may hold
+// any bytes.
+class Letter {
+ public:
+  Letter() : fd_(memfd_create("secpolicy", MFD_CLOEXEC)) {
+    if (fd_.Get() < 0) throw std::system_error(errno, std::generic_category(), "memfd_create");
+  }
+
+  void Write(const json& content) const {
+    const std::vector<std::uint8_t> bytes = json::to_cbor(content);
+    for (std::size_t done = 0; done < bytes.size();) {
+      const ssize_t size = write(fd_.Get(), &bytes[done], bytes.size() - done);
+      if (size < 0) throw std::system_error(errno, std::generic_category(), "write");
+      done += static_cast<std::size_t>(size);
+    }
+  }
+
+  [[nodiscard]] json Read() const {
+    if (lseek(fd_.Get(), 0, SEEK_SET) != 0) return nullptr;
+    const std::string bytes = StandIn::ReadAll(fd_.Get(), "result");
+    return bytes.empty() ? json() : json::from_cbor(bytes);
+  }
+
+ private:
+  UniqueFd fd_;
+};
+
+// What the terminate handler needs, which is not handed anything.
+struct Current {
+  Session& session;
+  const Letter& letter;
+  const std::function<json(Session&)>& work;
+};
+const Current* current = nullptr;
+
+// Runs the work and leaves its result, or what it threw, in the letter.
+int Finish(const Current& now) {
+  json content;
+  try {
+    content["result"] = now.work(now.session);
+  } catch (const std::exception& failure) {
+    content["failure"] = failure.what();
+  }
+  now.letter.Write(content);
+  return kDone;
+}
+
+[[noreturn]] void OnTerminate() {
+  try {
+    Finish(*current);
+  } catch (...) {
+    _exit(kFailed);
+  }
+  _exit(kTerminated);
+}
+
+// Adds a line of standard error; one without the mark of a message goes on with the last.
+void AddLine(std::vector<std::string>& errors, const std::string& line) {
+  constexpr std::string_view kMark = "Error: ";
+  if (line.starts_with(kMark)) {
+    errors.push_back(line.substr(kMark.size()));
+  } else if (errors.empty()) {
+    errors.push_back(line);
+  } else {
+    errors.back() += "\n" + line;
+  }
+}
+
+}  // namespace
+
+HostWork WorkInHost(StandIn::HostDirectory host, StandIn::SessionOptions options,
+                    const std::function<void(Session&)>& before,
+                    const std::function<json(Session&)>& work) {
+  const Letter letter;
+  HostWork outcome;
+  const auto inHost = [&] {
+    Session session(std::move(host), options);
+    const Current now{session, letter, work};
+    current = &now;
+    std::set_terminate(OnTerminate);
+    before(session);
+    return Finish(now);
+  };
+  const int status = RunInChild(inHost, [&](std::string& line) { AddLine(outcome.errors, line); });
+  if (WIFSIGNALED(status)) {
+    throw std::runtime_error(std::string("the work in the host was killed (") +
+                             strsignal(WTERMSIG(status)) + ")");
+  }
+  const json content = letter.Read();
+  if (content.contains("failure")) {
+    throw std::runtime_error(content["failure"].get_ref<const std::string&>());
+  }
+  outcome.wasTerminated = WEXITSTATUS(status) == kTerminated;
+  if (content.contains("result")) {
+    outcome.result = content["result"];
+  } else if (!outcome.errors.empty()) {
+    throw std::runtime_error(outcome.errors.back());
+  }
+  return outcome;
+}
+
+}  // namespace SecPolicyTool
