@@ -1,0 +1,17 @@
+// Everything that can be said about a policy directory before it is loaded.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "host/image/host_directory.h"
+#include "tools/check/finding.h"
+
+namespace SecPolicyTool {
+
+// All findings in the policy directory `dir` (the host's own one when it is empty), judged by a
+// host whose kernel has just been started: in the order of files and lines, those without a place
+// last. Places name files as `dir` does. Throws as ReadSource does.
+std::vector<Finding> CheckPolicy(StandIn::HostDirectory host, const std::string& dir);
+
+}  // namespace SecPolicyTool
