@@ -1,6 +1,7 @@
 #include "tools/policy/child_process.h"
 
 #include <fcntl.h>
+#include <poll.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -49,10 +50,22 @@ void TakeLines(std::string& text, const std::function<void(std::string&)>& line)
   text.erase(0, start);
 }
 
-void ReadLines(int fd, const std::function<void(std::string&)>& line) {
+// Calls `tick` until something can be read.
+void AwaitInput(int fd, const std::function<void()>& tick) {
+  constexpr int kTickMilliseconds = 200;
+  for (;;) {
+    pollfd input{fd, POLLIN, 0};
+    if (poll(&input, 1, kTickMilliseconds) != 0) return;
+    tick();
+  }
+}
+
+void ReadLines(int fd, const std::function<void(std::string&)>& line,
+               const std::function<void()>& tick) {
   std::string text;
   std::array<char, 4096> buffer;
   for (;;) {
+    AwaitInput(fd, tick);
     const ssize_t size = read(fd, buffer.data(), buffer.size());
     if (size < 0 && errno == EINTR) continue;
     if (size <= 0) break;
@@ -72,8 +85,8 @@ int WaitFor(pid_t child) {
 
 }  // namespace
 
-int RunInChild(const std::function<int()>& work,
-               const std::function<void(std::string& line)>& line) {
+int RunInChild(const std::function<int()>& work, const std::function<void(std::string& line)>& line,
+               const std::function<void()>& tick) {
   int ends[2];
   if (pipe2(ends, O_CLOEXEC) != 0) ThrowSystemError("pipe2");
   UniqueFd readEnd(ends[0]);
@@ -85,7 +98,7 @@ int RunInChild(const std::function<int()>& work,
     BeChild(work, std::move(writeEnd));
   }
   writeEnd.Reset();
-  ReadLines(readEnd.Get(), line);
+  ReadLines(readEnd.Get(), line, tick);
   return WaitFor(child);
 }
 

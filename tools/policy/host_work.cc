@@ -12,6 +12,7 @@
 #include "host/image/file_io.h"
 #include "tools/policy/child_process.h"
 #include "tools/policy/exit_status.h"
+#include "tools/policy/progress.h"
 
 namespace SecPolicyTool {
 
@@ -104,7 +105,9 @@ HostWork WorkInHost(StandIn::HostDirectory host, StandIn::SessionOptions options
     before(session);
     return Finish(now);
   };
-  const int status = RunInChild(inHost, [&](std::string& line) { AddLine(outcome.errors, line); });
+  Progress progress("Working in the host");
+  const int status = RunInChild(
+      inHost, [&](std::string& line) { AddLine(outcome.errors, line); }, [&] { progress.Tick(); });
   if (WIFSIGNALED(status)) {
     throw std::runtime_error(std::string("the work in the host was killed (") +
                              strsignal(WTERMSIG(status)) + ")");

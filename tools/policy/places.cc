@@ -3,45 +3,21 @@
 #include <sys/prctl.h>
 
 #include <algorithm>
-#include <filesystem>
 
 #include "host/module/permission_letters.h"
 #include "platform/zek_access.h"
 #include "secpolicy/secpolicy.h"
+#include "tools/policy/label_lines.h"
 #include "tools/policy/policy_text.h"
 
 namespace SecPolicyTool {
 
 namespace {
 
-namespace fs = std::filesystem;
-
 // Tardisk policy is read from here, whatever directory is loaded.
 constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
 
 using Lines = std::vector<PolicyLine>;
-
-Lines LinesOf(const std::string& path) try {
-  return ReadPolicyFile(path).lines;
-} catch (const std::runtime_error&) {
-  return {};
-}
-
-// The policy files of `dir` in the order of a load, by name. None when it cannot be listed.
-std::vector<std::string> FilesOf(const std::string& dir) {
-  std::map<std::string, std::string> files;
-  try {
-    SecPolicy::GetFileList(dir, files);
-  } catch (const Tavon::Lib::TavonException&) {
-  }
-  std::vector<std::string> names;
-  for (const auto& [path, name] : files) names.push_back(name);
-  return names;
-}
-
-Place PlaceOf(const std::string& file, const PolicyLine& line) {
-  return {file, line.number, line.words.empty() ? 0 : line.words.front().column};
-}
 
 // The line's words, from the one at `first` on, as far as there are so many.
 std::vector<std::string> WordsFrom(const PolicyLine& line, std::size_t first, std::size_t count) {
@@ -63,13 +39,6 @@ std::string ResolvedPath(const std::string& path) {
   SecPolicy::ZekAccess_FileRule rule{};
   if (prctl(ZekCtl::Kernel::kPrctlResolvePath, path.c_str(), rule.path) == 0) return rule.path;
   return path.substr(0, sizeof rule.path - 1);
-}
-
-// A path within the host, by which the kernel knows a file.
-std::string WithoutLinks(const std::string& path) {
-  std::error_code error;
-  const fs::path resolved = fs::canonical(path, error);
-  return error ? path : resolved.string();
 }
 
 // ---- Rules ----
@@ -105,11 +74,11 @@ void PlacePathRules(const std::string& file, const Lines& lines, DomainContent& 
 }
 
 void PlaceDomains(const PolicyFiles& files, Policy& policy) {
-  for (const std::string& name : FilesOf(files.path + "/domains")) {
+  for (const std::string& name : PolicyFileNames(files.path + "/domains")) {
     const auto domain = policy.domains.find(name);
     if (domain == policy.domains.end()) continue;
     const std::string file = files.shown + "/domains/" + name;
-    const Lines lines = LinesOf(files.path + "/domains/" + name);
+    const Lines lines = PolicyLines(files.path + "/domains/" + name);
     domain->second.place = Place{file, 0, 0};
     PlaceKeywordRules(file, lines, domain->second);
     PlacePathRules(file, lines, domain->second);
@@ -119,9 +88,9 @@ void PlaceDomains(const PolicyFiles& files, Policy& policy) {
 // ---- Objects ----
 
 void PlaceObjects(const PolicyFiles& files, Policy& policy) {
-  for (const std::string& name : FilesOf(files.path + "/objects")) {
+  for (const std::string& name : PolicyFileNames(files.path + "/objects")) {
     const std::string file = files.shown + "/objects/" + name;
-    for (const PolicyLine& line : LinesOf(files.path + "/objects/" + name)) {
+    for (const PolicyLine& line : PolicyLines(files.path + "/objects/" + name)) {
       if (line.words.size() != 1) continue;
       const auto object = policy.objects.find(line.words[0].text);
       if (object == policy.objects.end() || object->second.place) continue;
@@ -132,52 +101,12 @@ void PlaceObjects(const PolicyFiles& files, Policy& policy) {
 
 // ---- File labels ----
 
-struct LabelLine {
-  std::size_t order;  // among all lines of all files
-  bool isRecursive;
-  std::string label;
-  Place place;
-};
-
-// By the path that the kernel knows, in their order.
-std::map<std::string, std::vector<LabelLine>> LabelLines(const PolicyFiles& files) {
-  constexpr std::string_view kBelow = "/*";
-  std::map<std::string, std::vector<LabelLine>> found;
-  std::size_t order = 0;
-  for (const std::string& name : FilesOf(files.path + "/fileLabels")) {
-    for (const PolicyLine& line : LinesOf(files.path + "/fileLabels/" + name)) {
-      if (line.words.size() != 2) continue;
-      std::string path = line.words[0].text;
-      const bool isRecursive = path.ends_with(kBelow);
-      if (isRecursive) path.erase(path.size() - kBelow.size());
-      found[WithoutLinks(path)].push_back({order++, isRecursive, line.words[1].text,
-                                           PlaceOf(files.shown + "/fileLabels/" + name, line)});
-    }
-  }
-  return found;
-}
-
-// The last of the lines that labelled the file.
-std::optional<Place> PlaceOfLabel(const std::string& path, const std::string& label,
-                                  const std::map<std::string, std::vector<LabelLine>>& lines) {
-  const LabelLine* last = nullptr;
-  for (fs::path above = path;; above = above.parent_path()) {
-    if (const auto at = lines.find(above.string()); at != lines.end()) {
-      for (const LabelLine& line : at->second) {
-        const bool covers = line.isRecursive || above == path;
-        const bool isLater = last == nullptr || line.order > last->order;
-        if (covers && line.label == label && isLater) last = &line;
-      }
-    }
-    if (above == above.parent_path()) break;
-  }
-  return last == nullptr ? std::nullopt : std::optional(last->place);
-}
-
 void PlaceFileLabels(const PolicyFiles& files, Policy& policy) {
   if (policy.files.empty()) return;
-  const auto lines = LabelLines(files);
-  for (auto& [path, file] : policy.files) file.place = PlaceOfLabel(path, file.label, lines);
+  const LabelLines lines(files);
+  for (auto& [path, file] : policy.files) {
+    if (const LabelLine* line = lines.LineFor(path, file.label)) file.place = line->place;
+  }
 }
 
 // ---- Tardisks ----
@@ -191,7 +120,7 @@ std::string TardiskOf(const StandIn::ImageIndex& image, const std::string& path)
 }
 
 void PlaceTardisk(const std::string& path, const std::string& tardisk, Policy& policy) {
-  for (const PolicyLine& line : LinesOf(path)) {
+  for (const PolicyLine& line : PolicyLines(path)) {
     if (line.words.size() != 3 || line.words[0].text != "-E") continue;
     const std::string& label = line.words[1].text;
     const auto labelled = policy.tardisks.find(tardisk);
@@ -208,7 +137,7 @@ void PlaceTardisk(const std::string& path, const std::string& tardisk, Policy& p
 }
 
 void PlaceTardisks(const StandIn::ImageIndex& image, Policy& policy) {
-  for (const std::string& name : FilesOf(kTardiskPolicyDir)) {
+  for (const std::string& name : PolicyFileNames(kTardiskPolicyDir)) {
     const std::string path = std::string(kTardiskPolicyDir) + "/" + name;
     PlaceTardisk(path, TardiskOf(image, path), policy);
   }

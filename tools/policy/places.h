@@ -1,18 +1,11 @@
 // Where in its files a loaded policy was decided.
 #pragma once
 
-#include <string>
-
 #include "host/image/image_index.h"
 #include "tools/policy/policy.h"
+#include "tools/policy/policy_files.h"
 
 namespace SecPolicyTool {
-
-// A policy directory: its path in the host, and what its user calls it.
-struct PolicyFiles {
-  std::string path;
-  std::string shown;
-};
 
 // Gives what `policy`, the outcome of a load of `files`, holds the places of the lines that decided
 // it; nothing to what no line decided, such as the rule for tardisks without a policy. To be called

@@ -54,4 +54,14 @@ PolicyText ReadPolicyFile(const std::string& path) {
   return ReadPolicyText(content);
 }
 
+std::vector<PolicyLine> PolicyLines(const std::string& path) try {
+  return ReadPolicyFile(path).lines;
+} catch (const std::runtime_error&) {
+  return {};
+}
+
+Place PlaceOf(const std::string& file, const PolicyLine& line) {
+  return {file, line.number, line.words.empty() ? 0 : line.words.front().column};
+}
+
 }  // namespace SecPolicyTool

@@ -6,6 +6,8 @@
 #include <string_view>
 #include <vector>
 
+#include "tools/policy/policy.h"
+
 namespace SecPolicyTool {
 
 struct LineWord {
@@ -37,5 +39,11 @@ PolicyText ReadPolicyText(std::string_view content);
 // The same of a file. Throws std::runtime_error "Unable to open policy file " + path, as a load
 // reports it.
 PolicyText ReadPolicyFile(const std::string& path);
+
+// The lines of a file; none of one that cannot be opened.
+std::vector<PolicyLine> PolicyLines(const std::string& path);
+
+// Where a line of `file` begins: at its first word.
+Place PlaceOf(const std::string& file, const PolicyLine& line);
 
 }  // namespace SecPolicyTool

@@ -13,6 +13,7 @@
 #include "tools/policy/child_process.h"
 #include "tools/policy/output.h"
 #include "tools/policy/policy_path.h"
+#include "tools/policy/progress.h"
 #include "tools/policy/progress_filter.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
@@ -88,10 +89,15 @@ ExitStatus Load(const LoadArguments& arguments) {
   StandIn::HostDirectory host = OpenHost(arguments.host);
   const StandIn::StateFile state(host);
   const StandIn::StateFile::Version before = state.CurrentVersion();
-  const int status = RunInChild([&] { return LoadIn(std::move(host), arguments); },
-                                [](std::string& line) {
-                                  if (FilterProgress(line)) std::cerr << line + "\n";
-                                });
+  Progress progress("Loading");
+  const auto show = [&](std::string& line) {
+    if (!FilterProgress(line)) return;
+    progress.Clear();
+    std::cerr << line + "\n";
+  };
+  const int status = RunInChild([&] { return LoadIn(std::move(host), arguments); }, show,
+                                [&] { progress.Tick(); });
+  progress.Clear();
   if (WIFSIGNALED(status)) {
     ReportError(std::string("the load was killed (") + strsignal(WTERMSIG(status)) + "); " +
                 WhatTheKernelHolds(state.ChangedSince(before)));
