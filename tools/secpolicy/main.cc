@@ -17,6 +17,9 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddLoad(app, status);
   AddShow(app, status);
   AddDigest(app, status);
+  AddLabel(app, status);
+  AddDomain(app, status);
+  AddFiles(app, status);
   CLI::App* host = app.add_subcommand("host", "Make, assemble and inspect host directories");
   host->require_subcommand(1);
   AddHostInit(*host, status);

@@ -1,13 +1,11 @@
 // secpolicy show [--host DIR] [DOMAIN-ID]
-#include <syslog.h>
-
 #include <memory>
 #include <optional>
 #include <stdexcept>
 
-#include "host/image/session.h"
 #include "secpolicy/secpolicy.h"
 #include "tools/secpolicy/host_option.h"
+#include "tools/secpolicy/host_use.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
@@ -27,9 +25,8 @@ void RequireDomain(StandIn::SecurityModule& module, unsigned int domain) {
 }
 
 void Show(const ShowArguments& arguments) {
-  openlog("secpolicy", LOG_NDELAY, LOG_USER);
-  StandIn::Session session(OpenHost(arguments.host), {});
-  if (arguments.domain) RequireDomain(session.Module(), *arguments.domain);
+  const auto session = EnterHost(arguments.host);
+  if (arguments.domain) RequireDomain(session->Module(), *arguments.domain);
   SecPolicy::DisplayPolicy(arguments.domain ? std::to_string(*arguments.domain) : "");
 }
 

@@ -1,0 +1,200 @@
+// secpolicy label get|set|verify
+#include <unistd.h>
+
+#include <iostream>
+#include <memory>
+#include <stdexcept>
+
+#include "secpolicy/secpolicy.h"
+#include "tools/labels/label_tree.h"
+#include "tools/policy/label_lines.h"
+#include "tools/policy/output.h"
+#include "tools/policy/policy_json.h"
+#include "tools/policy/policy_path.h"
+#include "tools/policy/progress.h"
+#include "tools/policy/terminal.h"
+#include "tools/secpolicy/host_option.h"
+#include "tools/secpolicy/host_use.h"
+#include "tools/secpolicy/verbs.h"
+
+namespace SecPolicyTool {
+
+using nlohmann::json;
+using SecPolicy::ZekAccessInterfaceImpl;
+
+namespace {
+
+struct LabelArguments {
+  std::string host;
+  bool isJson = false;
+  std::string path;
+  std::string label;
+  std::string policy;
+  bool isTree = false;
+  bool isDryRun = false;
+
+  [[nodiscard]] Extent Reach() const { return isTree ? Extent::kTree : Extent::kFile; }
+};
+
+// What was found out about the files that a verb visits.
+struct Results {
+  json rows = json::array();
+  ExitStatus status = kDone;
+
+  void Fail(const std::string& text) {
+    ReportError(text);
+    status = kFailed;
+  }
+};
+
+// Files are the host's, whose working directory is its root.
+void RequireAbsolute(const std::string& path) {
+  if (!path.starts_with('/')) {
+    throw std::runtime_error("\"" + path + "\" is not absolute: a path in the host begins with /");
+  }
+}
+
+// Hands the label of each file to `use`; one that cannot be read is reported.
+template <typename Use>
+void ForEachLabel(const LabelArguments& arguments, Results& results, const Use& use) {
+  ZekAccessInterfaceImpl iface;
+  Progress progress("Reading labels");
+  ForEachLabelled(arguments.path, arguments.Reach(), [&](const std::string& path) {
+    progress.Step();
+    std::string label;
+    try {
+      label = SecPolicy::GetFileLabel(path, iface);
+    } catch (const Tavon::Lib::TavonException& failure) {
+      progress.Clear();
+      return results.Fail(failure.what());
+    }
+    use(path, label);
+  });
+}
+
+void Get(const LabelArguments& arguments, Results& results) {
+  ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
+    if (arguments.isJson) {
+      results.rows.push_back({{"path", path}, {"label", label}});
+    } else {
+      std::cout << Printable(label) << " " << Printable(path) << "\n";
+    }
+  });
+  if (arguments.isJson) PrintJson({{"files", results.rows}});
+}
+
+// What Set would change.
+void ShowChanges(const LabelArguments& arguments, Results& results) {
+  ZekAccessInterfaceImpl iface;
+  iface.LookupLabel(arguments.label, ZekCtl::Security::kObjectLabel);
+  ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
+    if (label == arguments.label) return;
+    std::cout << Printable(path) << ": " << Printable(label) << " -> " << Printable(arguments.label)
+              << "\n";
+  });
+}
+
+void SetLabels(const LabelArguments& arguments) {
+  ZekAccessInterfaceImpl iface;
+  if (arguments.isTree) {
+    SecPolicy::SetDirLabelRecursive(arguments.path, arguments.label, iface);
+  } else {
+    SecPolicy::SetFileLabel(arguments.path, arguments.label, iface);
+  }
+}
+
+// Compares the files' labels with those that the policy gives them.
+void Verify(const LabelArguments& arguments, const PolicyFiles& files, Results& results) {
+  const LabelLines lines(files);
+  ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
+    const LabelLine* line = lines.LineFor(WithoutLinks(path));
+    if (line == nullptr || line->label == label) return;
+    results.status = kFailed;
+    if (arguments.isJson) {
+      results.rows.push_back({{"path", path},
+                              {"label", label},
+                              {"expected", line->label},
+                              {"place", ToJson(line->place)}});
+    } else {
+      std::cout << Printable(path) << ": " << Printable(label) << ", not " << Printable(line->label)
+                << " (" << Printable(PlaceText(line->place)) << ")\n";
+    }
+  });
+  if (arguments.isJson) PrintJson({{"differences", results.rows}});
+}
+
+ExitStatus RunGet(const LabelArguments& arguments) {
+  Results results;
+  const auto session = EnterHost(arguments.host);
+  Get(arguments, results);
+  return results.status;
+}
+
+ExitStatus RunSet(const LabelArguments& arguments) {
+  Results results;
+  if (arguments.isDryRun) {
+    const auto session = EnterHost(arguments.host);
+    ShowChanges(arguments, results);
+    return results.status;
+  }
+  StandIn::SessionOptions options;
+  Progress progress("Setting labels");
+  // One operation sets one label; their lines are put together only for who is shown the progress.
+  if (isatty(STDERR_FILENO) == 1) options.trace = [&](const std::string&) { progress.Step(); };
+  const auto session = EnterHost(arguments.host, options);
+  session->BeginBatch();
+  try {
+    SetLabels(arguments);
+  } catch (const std::exception& failure) {
+    results.Fail(failure.what());
+  }
+  // What was set before a failure stays set.
+  session->Commit();
+  return results.status;
+}
+
+ExitStatus RunVerify(const LabelArguments& arguments) {
+  Results results;
+  const PolicyPath policy = LocatePolicy(arguments.policy);
+  StandIn::SessionOptions options;
+  options.visible = policy.visible;
+  const auto session = EnterHost(arguments.host, options);
+  const PolicyFiles files{policy.path, arguments.policy.empty() ? policy.path : arguments.policy};
+  std::map<std::string, std::string> listed;
+  SecPolicy::GetFileList(files.path + "/fileLabels", listed);
+  Verify(arguments, files, results);
+  return results.status;
+}
+
+}  // namespace
+
+void AddLabel(CLI::App& app, ExitStatus& status) {
+  CLI::App* label = app.add_subcommand("label", "Read, set and compare the labels of files");
+  label->require_subcommand(1);
+  const auto arguments = std::make_shared<LabelArguments>();
+  const auto add = [&](const char* name, const char* description, auto run) {
+    CLI::App* verb = label->add_subcommand(name, description);
+    AddHostOption(*verb, arguments->host);
+    verb->add_flag("-R,--recursive", arguments->isTree,
+                   "The directory and everything below it, links and sockets excepted");
+    verb->add_option("PATH", arguments->path, "An absolute path in the host")->required();
+    verb->callback([arguments, run, &status] {
+      RequireAbsolute(arguments->path);
+      status = run(*arguments);
+    });
+    return verb;
+  };
+  AddJsonOption(*add("get", "Print the labels of files", RunGet), arguments->isJson);
+  CLI::App* set = add("set", "Set the labels of files", RunSet);
+  set->add_option("LABEL", arguments->label, "The object label")->required();
+  set->add_flag("-n,--dry-run", arguments->isDryRun, "Only show what would change");
+  CLI::App* verify =
+      add("verify", "List the files that carry another label than a policy gives them", RunVerify);
+  verify
+      ->add_option("--policy", arguments->policy,
+                   "The policy directory; without it, the host's own /etc/olvane/secpolicy")
+      ->type_name("DIR");
+  AddJsonOption(*verify, arguments->isJson);
+}
+
+}  // namespace SecPolicyTool
