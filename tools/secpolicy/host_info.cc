@@ -76,7 +76,7 @@ void AddHostInfo(CLI::App& app, ExitStatus&) {
   CLI::App* verb =
       app.add_subcommand("info", "Say what a host is made of and what its kernel holds");
   const auto dir = std::make_shared<std::string>();
-  verb->add_option("DIR", *dir, "The host directory")->required();
+  verb->add_option("DIR", *dir, "The host directory")->type_name("DIR")->required();
   verb->callback([dir] { PrintInfo(HostDirectory(*dir)); });
 }
 

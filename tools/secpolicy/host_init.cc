@@ -11,7 +11,7 @@ namespace SecPolicyTool {
 void AddHostInit(CLI::App& app, ExitStatus&) {
   CLI::App* verb = app.add_subcommand("init", "Make a host directory with the default description");
   const auto dir = std::make_shared<std::string>();
-  verb->add_option("DIR", *dir, "The directory to make")->required();
+  verb->add_option("DIR", *dir, "The directory to make")->type_name("DIR")->required();
   verb->callback([dir] {
     StandIn::HostDirectory::Create(*dir, StandIn::DefaultDescriptionText());
     std::cerr << "Made the host directory " + *dir + ". Put its tardisks into " + *dir +

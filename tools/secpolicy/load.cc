@@ -127,7 +127,8 @@ void AddLoad(CLI::App& app, ExitStatus& status) {
       ->allow_extra_args(false)  // what follows is the policy directory
       ->check(FaultProblem);
   verb->add_option("POLICYDIR", arguments->policy,
-                   "The policy directory; without it, the host's own /etc/olvane/secpolicy");
+                   "The policy directory; without it, the host's own /etc/olvane/secpolicy")
+      ->type_name("DIR");
   verb->callback([arguments, faults, &status] {
     for (const std::string& fault : *faults) {
       arguments->faults.push_back(StandIn::ParseFault(fault));

@@ -25,6 +25,7 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddHostInit(*host, status);
   AddHostAssemble(*host, status);
   AddHostInfo(*host, status);
+  AddCompletion(app, status);
 }
 
 ExitStatus Run(int argc, char** argv) {
