@@ -1,7 +1,7 @@
 // The verbs over a kernel's domains.
 #include <unistd.h>
 
-#include "tests/tools/command_fixture.h"
+#include "tests/tools/group_fixture.h"
 #include "tests/tools/schema.h"
 
 namespace SecPolicyTool {
@@ -9,26 +9,11 @@ namespace {
 
 using testing::HasSubstr;
 
-class DomainTest : public CommandTest {
+class DomainTest : public GroupTest {
  protected:
-  void SetUp() override { MakeHost(); }
+  DomainTest() : GroupTest("domain") {}
 
-  [[nodiscard]] Result Domain(Arguments arguments) const {
-    arguments.insert(arguments.begin(), "domain");
-    arguments.insert(arguments.begin() + 2, {"--host", Host()});
-    return Command(arguments);
-  }
-  std::string Out(const Arguments& arguments) const {
-    const Result result = Domain(arguments);
-    EXPECT_EQ(result.status, 0) << result.err;
-    return result.out;
-  }
-  void ExpectRefusal(const Arguments& arguments, const std::string& error) const {
-    const Result result = Domain(arguments);
-    EXPECT_EQ(result.status, 1) << arguments[0];
-    EXPECT_EQ(result.out, "");
-    EXPECT_EQ(result.err, "Error: " + error + "\n");
-  }
+  void SetUp() override { MakeHost(); }
 };
 
 TEST_F(DomainTest, CreatedOneIsListed) {

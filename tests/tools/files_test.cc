@@ -1,5 +1,5 @@
 // The verbs over a domain's file rules.
-#include "tests/tools/command_fixture.h"
+#include "tests/tools/group_fixture.h"
 #include "tests/tools/schema.h"
 
 namespace SecPolicyTool {
@@ -7,25 +7,11 @@ namespace {
 
 using testing::HasSubstr;
 
-class FilesTest : public CommandTest {
+class FilesTest : public GroupTest {
  protected:
-  void SetUp() override { MakeHost(); }
+  FilesTest() : GroupTest("files") {}
 
-  [[nodiscard]] Result Files(Arguments arguments) const {
-    arguments.insert(arguments.begin(), "files");
-    arguments.insert(arguments.begin() + 2, {"--host", Host()});
-    return Command(arguments);
-  }
-  std::string Out(const Arguments& arguments) const {
-    const Result result = Files(arguments);
-    EXPECT_EQ(result.status, 0) << result.err;
-    return result.out;
-  }
-  void ExpectRefusal(const Arguments& arguments, const std::string& error) const {
-    const Result result = Files(arguments);
-    EXPECT_EQ(result.status, 1) << arguments[0];
-    EXPECT_EQ(result.err, "Error: " + error + "\n");
-  }
+  void SetUp() override { MakeHost(); }
 };
 
 TEST_F(FilesTest, AddedRulesAreListedAndCounted) {
@@ -91,7 +77,7 @@ TEST_F(FilesTest, LongestPathIsTaken) {
 
 TEST_F(FilesTest, PermissionThatIsNoneIsWrongUsage) {
   for (const char* wrong : {"q", "rr", "rwxr", "R", ""}) {
-    const Result result = Files({"add", "rootDom", "/a", wrong});
+    const Result result = Use({"add", "rootDom", "/a", wrong});
     EXPECT_EQ(result.status, 2) << wrong;
     EXPECT_THAT(result.err, HasSubstr("is no permission: it takes letters of \"rwx\", each once"))
         << wrong;

@@ -1,5 +1,5 @@
 // The verbs over the labels of files.
-#include "tests/tools/command_fixture.h"
+#include "tests/tools/group_fixture.h"
 #include "tests/tools/schema.h"
 
 namespace SecPolicyTool {
@@ -7,8 +7,10 @@ namespace {
 
 using testing::HasSubstr;
 
-class LabelTest : public CommandTest {
+class LabelTest : public GroupTest {
  protected:
+  LabelTest() : GroupTest("label") {}
+
   void SetUp() override {
     StandIn::Archive base;
     base.Directory("etc").File("etc/hosts", "").File("etc/motd", "").Directory("etc/net");
@@ -16,17 +18,6 @@ class LabelTest : public CommandTest {
     MakeHost({{"base.tar", base}});
     Policy("objects/base", "conf\nnetConf\n");
     ASSERT_EQ(Load().status, 0);
-  }
-
-  [[nodiscard]] Result Label(Arguments arguments) const {
-    arguments.insert(arguments.begin(), "label");
-    arguments.insert(arguments.begin() + 2, {"--host", Host()});
-    return Command(arguments);
-  }
-  std::string Out(const Arguments& arguments) const {
-    const Result result = Label(arguments);
-    EXPECT_EQ(result.status, 0) << result.err;
-    return result.out;
   }
 };
 
@@ -61,23 +52,23 @@ TEST_F(LabelTest, UnknownLabelIsRefused) {
   for (const Arguments& more : std::vector<Arguments>{{}, {"--dry-run"}, {"-R"}}) {
     Arguments arguments{"set", "/etc", "nconf"};
     arguments.insert(arguments.end(), more.begin(), more.end());
-    const Result result = Label(arguments);
+    const Result result = Use(arguments);
     EXPECT_EQ(result.status, 1);
     EXPECT_EQ(result.err, refusal);
   }
 }
 
 TEST_F(LabelTest, MissingFileIsReported) {
-  EXPECT_EQ(Label({"get", "/none"}).err,
+  EXPECT_EQ(Use({"get", "/none"}).err,
             "Error: Unable to get file label for file /none:No such file or directory\n");
-  const Result result = Label({"set", "/none", "conf"});
+  const Result result = Use({"set", "/none", "conf"});
   EXPECT_EQ(result.status, 1);
   EXPECT_EQ(result.err,
             "Error: Unable to set file label (conf) for file /none: No such file or directory\n");
 }
 
 TEST_F(LabelTest, PathHasToBeAbsolute) {
-  const Result result = Label({"get", "etc"});
+  const Result result = Use({"get", "etc"});
   EXPECT_EQ(result.status, 1);
   EXPECT_EQ(result.err, "Error: \"etc\" is not absolute: a path in the host begins with /\n");
 }
@@ -92,7 +83,7 @@ TEST_F(LabelTest, DifferencesAreListedWithTheLineThatDecides) {
   Policy("fileLabels/base", "/etc/* conf\n  /etc/net/* netConf # later\n");
   Out({"set", "/etc/motd", "conf"});
   Out({"set", "/etc/net/conf", "conf"});
-  const Result result = Label({"verify", "-R", "--policy", PolicyDir(), "/etc"});
+  const Result result = Use({"verify", "-R", "--policy", PolicyDir(), "/etc"});
   EXPECT_EQ(result.status, 1);
   const std::string file = PolicyDir() + "/fileLabels/base";
   EXPECT_EQ(result.out, "/etc: default, not conf (" + file +
@@ -108,11 +99,11 @@ TEST_F(LabelTest, DifferencesAreListedWithTheLineThatDecides) {
                             ":2:3)\n"
                             "/etc/pipe: default, not conf (" +
                             file + ":1:1)\n");
-  EXPECT_EQ(Label({"verify", "--policy", PolicyDir(), "/etc/motd"}).status, 0);
+  EXPECT_EQ(Use({"verify", "--policy", PolicyDir(), "/etc/motd"}).status, 0);
 }
 
 TEST_F(LabelTest, PolicyWithoutFileLabelsIsSaid) {
-  const Result result = Label({"verify", "/etc"});
+  const Result result = Use({"verify", "/etc"});
   EXPECT_EQ(result.status, 1);
   EXPECT_EQ(result.err,
             "Error: Unable to open policy directory /etc/olvane/secpolicy/fileLabels\n");
@@ -123,7 +114,7 @@ TEST_F(LabelTest, JsonIsAsDescribed) {
   const std::string files = Out({"get", "-R", "--json", "/etc"});
   EXPECT_EQ(JsonProblem(files, "label-get"), "") << files;
   EXPECT_THAT(files, HasSubstr("\"path\": \"/etc/net/conf\""));
-  const Result result = Label({"verify", "-R", "--json", "--policy", PolicyDir(), "/etc"});
+  const Result result = Use({"verify", "-R", "--json", "--policy", PolicyDir(), "/etc"});
   EXPECT_EQ(result.status, 1);
   EXPECT_EQ(JsonProblem(result.out, "label-verify"), "") << result.out;
   EXPECT_THAT(result.out, HasSubstr("\"expected\": \"conf\""));
