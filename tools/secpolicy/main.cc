@@ -17,6 +17,7 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddLoad(app, status);
   AddShow(app, status);
   AddDigest(app, status);
+  AddDiff(app, status);
   AddLabel(app, status);
   AddDomain(app, status);
   AddFiles(app, status);

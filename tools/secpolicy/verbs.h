@@ -10,6 +10,7 @@ namespace SecPolicyTool {
 // Each adds its verb to `app`. The verb's callback does the work and stores how it ended in
 // `status`; what it throws is reported by main and ends the command with kFailed.
 void AddCompletion(CLI::App& app, ExitStatus& status);
+void AddDiff(CLI::App& app, ExitStatus& status);
 void AddDigest(CLI::App& app, ExitStatus& status);
 void AddDomain(CLI::App& app, ExitStatus& status);
 void AddFiles(CLI::App& app, ExitStatus& status);
