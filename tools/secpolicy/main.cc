@@ -18,6 +18,7 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddShow(app, status);
   AddDigest(app, status);
   AddDiff(app, status);
+  AddSearch(app, status);
   AddLabel(app, status);
   AddDomain(app, status);
   AddFiles(app, status);

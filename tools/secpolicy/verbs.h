@@ -19,6 +19,7 @@ void AddHostAssemble(CLI::App& app, ExitStatus& status);
 void AddHostInfo(CLI::App& app, ExitStatus& status);
 void AddLabel(CLI::App& app, ExitStatus& status);
 void AddLoad(CLI::App& app, ExitStatus& status);
+void AddSearch(CLI::App& app, ExitStatus& status);
 void AddShow(CLI::App& app, ExitStatus& status);
 
 }  // namespace SecPolicyTool

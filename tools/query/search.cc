@@ -1,0 +1,86 @@
+#include "tools/query/search.h"
+
+#include <algorithm>
+#include <array>
+#include <map>
+
+#include "tools/policy/terminal.h"
+#include "tools/query/paths.h"
+
+namespace SecPolicyTool {
+
+namespace {
+
+// By RuleType.
+constexpr std::array<const char*, 8> kShortNames{"access", "capability", "transition", "create",
+                                                 "param",  "path",       "syscall",    "socket"};
+
+// The path rules of a domain that decide on a path, by their world.
+using Deciding = std::map<StandIn::WorldId, const PolicyRule*>;
+
+std::string PathOf(const PolicyRule& rule) { return NormalPath(rule.key.words[0]); }
+
+Deciding DecidingOn(const std::string& path, const DomainContent& domain) {
+  Deciding deciding;
+  for (const PolicyRule& rule : domain.rules) {
+    if (rule.key.type != RuleType::kPath || !IsAtOrBelow(path, PathOf(rule))) continue;
+    const PolicyRule*& best = deciding[rule.key.world];
+    if (best == nullptr || PathOf(*best).size() <= PathOf(rule).size()) best = &rule;
+  }
+  return deciding;
+}
+
+bool Grants(const PolicyRule& rule) {
+  return rule.key.type == RuleType::kPath ? rule.permission != 0 : rule.isGranted;
+}
+
+bool SpeaksOf(const PolicyRule& rule, const std::string& path, const Deciding& deciding) {
+  if (rule.key.type != RuleType::kPath) return false;
+  const auto best = deciding.find(rule.key.world);
+  const bool isDeciding = best != deciding.end() && best->second == &rule;
+  return isDeciding || IsAtOrBelow(PathOf(rule), path);
+}
+
+bool HoldsFor(const SearchTerms& terms, const PolicyRule& rule) {
+  const auto& words = rule.key.words;
+  return (!terms.type || rule.key.type == *terms.type) &&
+         (!terms.isGranted || Grants(rule) == *terms.isGranted) &&
+         (!terms.word || std::any_of(words.begin(), words.end(), terms.word));
+}
+
+}  // namespace
+
+std::vector<FoundRule> Search(const Policy& policy, const SearchTerms& terms) {
+  std::vector<FoundRule> found;
+  for (const auto& [name, domain] : policy.domains) {
+    if (terms.domain && name != *terms.domain) continue;
+    const Deciding deciding = terms.path ? DecidingOn(*terms.path, domain) : Deciding();
+    for (const PolicyRule& rule : domain.rules) {
+      if (!HoldsFor(terms, rule)) continue;
+      if (terms.path && !SpeaksOf(rule, *terms.path, deciding)) continue;
+      found.push_back({&name, &rule});
+    }
+  }
+  return found;
+}
+
+std::string FoundText(const FoundRule& found) {
+  const std::optional<Place>& place = found.rule->place;
+  const bool hasFile = place && !place->file.empty();
+  const std::string where = hasFile ? PlaceText(Place{place->file, place->line, 0}) : *found.domain;
+  return Printable(where + ": " + LineOf(*found.rule));
+}
+
+std::optional<RuleType> TypeNamed(const std::string& name) {
+  for (std::size_t i = 0; i < kShortNames.size(); ++i) {
+    const auto type = static_cast<RuleType>(i);
+    const std::string keyword = InfoOf(type).keyword;
+    if (name == keyword || "-" + name == keyword || name == InfoOf(type).name ||
+        name == kShortNames.at(i)) {
+      return type;
+    }
+  }
+  return std::nullopt;
+}
+
+}  // namespace SecPolicyTool

@@ -1,0 +1,44 @@
+#include "tools/query/vocabulary.h"
+
+#include <stdexcept>
+
+#include "host/module/description_json.h"
+#include "host/module/nearest_word.h"
+#include "tools/policy/terminal.h"
+
+namespace SecPolicyTool {
+
+namespace {
+
+template <typename Content>
+std::vector<std::string> NamesOf(const std::map<std::string, Content>& entries) {
+  std::vector<std::string> names;
+  for (const auto& [name, content] : entries) names.push_back(name);
+  return names;
+}
+
+}  // namespace
+
+Vocabulary VocabularyOf(const StandIn::HostDirectory& host, const Policy& policy) {
+  Vocabulary words;
+  words.lists =
+      StandIn::ReadDescription(host.DescriptionText(), host.Ref().PathOf(StandIn::kDescriptionFile))
+          .words;
+  words.lists[StandIn::WordList::kObjects] = NamesOf(policy.objects);
+  words.domains = NamesOf(policy.domains);
+  return words;
+}
+
+std::string UnknownDomainText(const std::string& name, const std::vector<std::string>& domains) {
+  const std::string text = "no domain is called " + Printable(name);
+  const auto nearest = StandIn::NearestWord(name, domains);
+  return nearest ? text + " (nearest: " + Printable(*nearest) + ")" : text;
+}
+
+const DomainContent& DomainOf(const Policy& policy, const std::string& name) {
+  const auto domain = policy.domains.find(name);
+  if (domain != policy.domains.end()) return domain->second;
+  throw std::runtime_error(UnknownDomainText(name, NamesOf(policy.domains)));
+}
+
+}  // namespace SecPolicyTool
