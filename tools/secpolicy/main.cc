@@ -19,6 +19,8 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddDigest(app, status);
   AddDiff(app, status);
   AddSearch(app, status);
+  AddMay(app, status);
+  AddWho(app, status);
   AddLabel(app, status);
   AddDomain(app, status);
   AddFiles(app, status);

@@ -19,7 +19,9 @@ void AddHostAssemble(CLI::App& app, ExitStatus& status);
 void AddHostInfo(CLI::App& app, ExitStatus& status);
 void AddLabel(CLI::App& app, ExitStatus& status);
 void AddLoad(CLI::App& app, ExitStatus& status);
+void AddMay(CLI::App& app, ExitStatus& status);
 void AddSearch(CLI::App& app, ExitStatus& status);
 void AddShow(CLI::App& app, ExitStatus& status);
+void AddWho(CLI::App& app, ExitStatus& status);
 
 }  // namespace SecPolicyTool

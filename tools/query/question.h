@@ -1,0 +1,60 @@
+// Questions about what a domain may do, in words.
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "tools/policy/policy.h"
+#include "tools/query/vocabulary.h"
+
+namespace SecPolicyTool {
+
+// What is asked: whether a rule with this key grants, or for a path, whether the path rule that
+// decides on it permits `permission`, a bit of StandIn::kPermissionBits.
+struct Question {
+  RuleKey key;
+  std::uint32_t permission = 0;
+};
+
+// What is wrong with a question.
+class BadQuestion : public std::runtime_error {
+ public:
+  enum class Kind : std::uint8_t {
+    kForm,  // the number of its words
+    kWord,  // a word that the host or the policy does not have
+  };
+
+  BadQuestion(Kind kind, std::size_t word, const std::string& text)
+      : std::runtime_error(text), kind_(kind), word_(word) {}
+
+  [[nodiscard]] Kind Of() const { return kind_; }
+  // The word that is wrong, from 0.
+  [[nodiscard]] std::size_t Word() const { return word_; }
+
+ private:
+  Kind kind_;
+  std::size_t word_;
+};
+
+// Checks the number of words, the first of which is the operation, as far as this can be done
+// without knowing a host's words. Throws BadQuestion (kForm):
+//   "OPERATION takes other words: FORM [or FORM]"
+//   "WORD is no operation with N words (nearest: OPERATION)"
+//   "there is no operation OPERATION on a path; there are read, write and exec"
+void CheckForm(const std::vector<std::string>& words);
+
+using PathResolver = std::function<std::string(const std::string&)>;
+
+// The question in `words`. `resolve` is handed paths. Throws BadQuestion: those of CheckForm, and
+// (kWord) "unknown operation "WORD" (nearest: NEAREST)", "unknown LIST "WORD" (nearest: NEAREST)",
+// "no domain is called NAME (nearest: OTHER)".
+Question ParseQuestion(const std::vector<std::string>& words, const Vocabulary& vocabulary,
+                       const PathResolver& resolve);
+
+// The forms of questions, a line each, for help.
+std::string QuestionForms();
+
+}  // namespace SecPolicyTool

@@ -1,0 +1,49 @@
+// What the verbs that ask a policy have in common.
+#pragma once
+
+#include <CLI/CLI.hpp>
+#include <nlohmann/json.hpp>
+#include <string>
+#include <vector>
+
+#include "tools/query/host_paths.h"
+#include "tools/query/question.h"
+#include "tools/query/vocabulary.h"
+#include "tools/secpolicy/source_option.h"
+
+namespace SecPolicyTool {
+
+struct AskingArguments {
+  std::string host;
+  std::string policy = kKernelSource;
+  bool isJson = false;
+};
+
+// Adds "--host", "--policy" and "--json".
+void AddAskingOptions(CLI::App& verb, AskingArguments& arguments);
+
+// Adds the positional arguments of a question, to be read in the verb's callback.
+void AddQuestion(CLI::App& verb, std::vector<std::string>& words);
+
+// The policy that is asked, and what its questions may speak of.
+struct AskedPolicy {
+  Policy policy;
+  Vocabulary vocabulary;
+  HostPaths paths;
+
+  // Throws BadQuestion.
+  [[nodiscard]] Question Parse(const std::vector<std::string>& words) const;
+};
+
+// Throws as ReadPolicy does.
+AskedPolicy ReadAsked(const AskingArguments& arguments, OnErrors onErrors);
+
+// The same for a question, whose form is checked first. Throws CLI::ValidationError when that is
+// wrong.
+AskedPolicy ReadAskedFor(const std::vector<std::string>& words, const AskingArguments& arguments);
+
+// The members of --json that say what was asked.
+nlohmann::json AskedJson(const AskingArguments& arguments, const std::vector<std::string>& words,
+                         const Question& question);
+
+}  // namespace SecPolicyTool

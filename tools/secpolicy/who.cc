@@ -1,0 +1,67 @@
+// secpolicy who [--host DIR] [--policy SOURCE] [--json] OPERATION OBJECT...
+#include <iostream>
+#include <memory>
+
+#include "tools/policy/output.h"
+#include "tools/policy/terminal.h"
+#include "tools/query/decision.h"
+#include "tools/query/rule_json.h"
+#include "tools/secpolicy/asking.h"
+#include "tools/secpolicy/verbs.h"
+
+namespace SecPolicyTool {
+
+namespace {
+
+struct WhoArguments {
+  AskingArguments asking;
+  std::vector<std::string> words;
+};
+
+struct AllowedDomain {
+  std::string name;
+  const PolicyRule* rule;
+};
+
+std::vector<AllowedDomain> AllowedBy(const Policy& policy, const Question& question) {
+  std::vector<AllowedDomain> allowed;
+  for (const auto& [name, domain] : policy.domains) {
+    const Answer answer = DomainDecisions(domain).Decide(question);
+    if (answer.isAllowed) allowed.push_back({name, answer.rule});
+  }
+  return allowed;
+}
+
+ExitStatus PrintAllowed(const WhoArguments& arguments) {
+  const AskedPolicy asked = ReadAskedFor(arguments.words, arguments.asking);
+  const Question question = asked.Parse(arguments.words);
+  const std::vector<AllowedDomain> allowed = AllowedBy(asked.policy, question);
+  if (arguments.asking.isJson) {
+    nlohmann::json content = AskedJson(arguments.asking, arguments.words, question);
+    content["domains"] = nlohmann::json::array();
+    for (const AllowedDomain& each : allowed) {
+      content["domains"].push_back({{"domain", each.name}, {"rule", RuleJson(each.rule)}});
+    }
+    PrintJson(content);
+  } else {
+    for (const AllowedDomain& each : allowed) {
+      std::cout << Printable(each.name) << ": " << RuleText(*each.rule) << "\n";
+    }
+  }
+  return allowed.empty() ? kFailed : kDone;
+}
+
+}  // namespace
+
+void AddWho(CLI::App& app, ExitStatus& status) {
+  CLI::App* verb = app.add_subcommand("who", "Ask which domains are allowed something");
+  verb->footer("Questions:\n" + QuestionForms() +
+               "\nExit status: 0 some domain is, 1 none is, or an error was reported, 2 wrong "
+               "usage.");
+  const auto arguments = std::make_shared<WhoArguments>();
+  AddAskingOptions(*verb, arguments->asking);
+  AddQuestion(*verb, arguments->words);
+  verb->callback([arguments, &status] { status = PrintAllowed(*arguments); });
+}
+
+}  // namespace SecPolicyTool
