@@ -21,6 +21,7 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddSearch(app, status);
   AddMay(app, status);
   AddWho(app, status);
+  AddTest(app, status);
   AddLabel(app, status);
   AddDomain(app, status);
   AddFiles(app, status);
