@@ -7,9 +7,11 @@ namespace SecPolicyTool {
 
 void ReportError(const std::string& text) { std::cerr << "Error: " + text + "\n" << std::flush; }
 
-void PrintJson(const nlohmann::json& content) {
-  std::cout << content.dump(2, ' ', false, nlohmann::json::error_handler_t::replace) << "\n";
+std::string TextOfJson(const nlohmann::json& content) {
+  return content.dump(2, ' ', false, nlohmann::json::error_handler_t::replace) + "\n";
 }
+
+void PrintJson(const nlohmann::json& content) { std::cout << TextOfJson(content); }
 
 void FlushOutput() {
   if (!std::cout.flush()) throw std::runtime_error("standard output cannot be written");

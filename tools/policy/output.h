@@ -9,8 +9,11 @@ namespace SecPolicyTool {
 // "Error: " + text on standard error: the form in which the library reports, too.
 void ReportError(const std::string& text);
 
-// Prints `content` to standard output, indented. Bytes that are not UTF-8, which JSON cannot hold,
-// are replaced by U+FFFD.
+// `content` as lines of text, indented. Bytes that are not UTF-8, which JSON cannot hold, are
+// replaced by U+FFFD.
+std::string TextOfJson(const nlohmann::json& content);
+
+// Prints that to standard output.
 void PrintJson(const nlohmann::json& content);
 
 // Flushes standard output; throws std::runtime_error when something of it could not be written, so

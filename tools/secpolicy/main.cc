@@ -25,6 +25,8 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddLabel(app, status);
   AddDomain(app, status);
   AddFiles(app, status);
+  AddGraph(app, status);
+  AddPaths(app, status);
   CLI::App* host = app.add_subcommand("host", "Make, assemble and inspect host directories");
   host->require_subcommand(1);
   AddHostInit(*host, status);

@@ -1,0 +1,110 @@
+#include "tools/graph/path_forms.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+#include "host/module/nearest_word.h"
+#include "tools/policy/policy_json.h"
+
+namespace SecPolicyTool {
+
+using nlohmann::json;
+
+namespace {
+
+std::string RuleLine(const TransitionGraph& graph, const Transition& transition) {
+  PolicyRule rule;
+  rule.key = {RuleType::kTransition,
+              {transition.label, graph.Domains()[transition.to], transition.event},
+              0};
+  rule.isGranted = true;
+  return LineOf(rule);
+}
+
+std::string Name(const TransitionGraph& graph, std::size_t domain) {
+  return Printable(graph.Domains()[domain]);
+}
+
+std::string Counted(std::size_t count, const char* what) {
+  return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
+}
+
+// A step's rules, a line for each, aligned among one another.
+std::string StepText(const TransitionGraph& graph, const Link& link, const Painter& painter) {
+  std::size_t width = 0;
+  for (const Transition& rule : graph.TransitionsOf(link)) {
+    width = std::max(width, Printable(RuleLine(graph, rule)).size());
+  }
+  std::string text = "   " + Name(graph, link.from) + " -> " + Name(graph, link.to) + "\n";
+  for (const Transition& rule : graph.TransitionsOf(link)) {
+    const std::string line = Printable(RuleLine(graph, rule));
+    text += "     " + line + std::string(width - line.size() + 2, ' ') +
+            painter.Paint(Colour::kCyan, Printable(PlaceText(rule.place))) + "\n";
+  }
+  return text;
+}
+
+std::string PathText(const TransitionGraph& graph, const DomainPath& path, std::size_t number,
+                     const Painter& painter) {
+  std::string chain;
+  for (const std::size_t domain : path) {
+    chain += (chain.empty() ? "" : " -> ") + Name(graph, domain);
+  }
+  std::string text = std::to_string(number) + ". " + painter.Paint(Colour::kBold, chain) + " (" +
+                     Counted(path.size() - 1, "step") + ")\n";
+  for (std::size_t step = 0; step + 1 < path.size(); ++step) {
+    text += StepText(graph, LinkOf(graph, path, step), painter);
+  }
+  return text;
+}
+
+json StepJson(const TransitionGraph& graph, const Link& link) {
+  json rules = json::array();
+  for (const Transition& rule : graph.TransitionsOf(link)) {
+    rules.push_back({{"label", rule.label}, {"event", rule.event}, {"place", ToJson(rule.place)}});
+  }
+  return {{"from", graph.Domains()[link.from]},
+          {"to", graph.Domains()[link.to]},
+          {"rules", std::move(rules)}};
+}
+
+}  // namespace
+
+std::size_t RequireDomain(const TransitionGraph& graph, const std::string& name) {
+  if (const auto domain = graph.Find(name)) return *domain;
+  const auto nearest = StandIn::NearestWord(name, graph.Domains());
+  throw std::runtime_error("unknown domain \"" + Printable(name) + "\"" +
+                           (nearest ? " (nearest: " + Printable(*nearest) + ")" : ""));
+}
+
+std::string PathsText(const TransitionGraph& graph, const PathQuestion& question,
+                      const FoundPaths& found, const Painter& painter) {
+  if (found.paths.empty()) {
+    return Name(graph, question.to) + " is not reached from " + Name(graph, question.from) +
+           (question.event ? " by " + Printable(*question.event) : "") + "\n";
+  }
+  std::string text;
+  for (std::size_t i = 0; i < found.paths.size(); ++i) {
+    text += PathText(graph, found.paths[i], i + 1, painter);
+  }
+  if (found.hasMore) text += "There are more paths, which are not shorter.\n";
+  return text;
+}
+
+json PathsJson(const TransitionGraph& graph, const PathQuestion& question,
+               const FoundPaths& found) {
+  json paths = json::array();
+  for (const DomainPath& path : found.paths) {
+    json steps = json::array();
+    for (std::size_t step = 0; step + 1 < path.size(); ++step) {
+      steps.push_back(StepJson(graph, LinkOf(graph, path, step)));
+    }
+    paths.push_back(std::move(steps));
+  }
+  return {{"from", graph.Domains()[question.from]},
+          {"to", graph.Domains()[question.to]},
+          {"paths", std::move(paths)},
+          {"more", found.hasMore}};
+}
+
+}  // namespace SecPolicyTool

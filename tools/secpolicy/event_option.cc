@@ -1,0 +1,33 @@
+#include "tools/secpolicy/event_option.h"
+
+#include <algorithm>
+#include <stdexcept>
+#include <vector>
+
+#include "host/module/description_json.h"
+#include "host/module/module_description.h"
+#include "host/module/word_lists.h"
+#include "tools/policy/terminal.h"
+#include "tools/secpolicy/host_option.h"
+
+namespace SecPolicyTool {
+
+using StandIn::WordList;
+
+void AddEventOption(CLI::App& verb, std::optional<std::string>& event) {
+  verb.add_option("--event", event, "Only transitions on this event, for example \"exec\"")
+      ->type_name("EVENT");
+}
+
+void RequireEvent(const std::string& host, const std::optional<std::string>& event) {
+  if (!event) return;
+  const StandIn::HostDirectory directory = OpenHost(host);
+  const auto description = StandIn::ReadDescription(
+      directory.DescriptionText(), directory.Ref().PathOf(StandIn::kDescriptionFile));
+  const std::vector<std::string>& events = description.words.at(WordList::kTransitionEvents);
+  if (std::find(events.begin(), events.end(), *event) != events.end()) return;
+  throw std::runtime_error(
+      Printable(StandIn::UnknownWordText(WordList::kTransitionEvents, *event, events)));
+}
+
+}  // namespace SecPolicyTool
