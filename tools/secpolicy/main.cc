@@ -27,6 +27,7 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   AddFiles(app, status);
   AddGraph(app, status);
   AddPaths(app, status);
+  AddReport(app, status);
   CLI::App* host = app.add_subcommand("host", "Make, assemble and inspect host directories");
   host->require_subcommand(1);
   AddHostInit(*host, status);

@@ -23,6 +23,7 @@ void AddLoad(CLI::App& app, ExitStatus& status);
 void AddMay(CLI::App& app, ExitStatus& status);
 void AddSearch(CLI::App& app, ExitStatus& status);
 void AddPaths(CLI::App& app, ExitStatus& status);
+void AddReport(CLI::App& app, ExitStatus& status);
 void AddShow(CLI::App& app, ExitStatus& status);
 void AddTest(CLI::App& app, ExitStatus& status);
 void AddWho(CLI::App& app, ExitStatus& status);

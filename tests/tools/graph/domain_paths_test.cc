@@ -6,7 +6,7 @@
 
 #include <algorithm>
 
-#include "tests/tools/graph/some_policy.h"
+#include "tests/tools/some_policy.h"
 
 namespace SecPolicyTool {
 namespace {

@@ -3,6 +3,7 @@
 
 #include "tests/tools/command_fixture.h"
 #include "tests/tools/schema.h"
+#include "tests/tools/stand_in_dot.h"
 #include "tools/graph/graph_forms.h"
 #include "tools/graph/graphviz.h"
 
@@ -33,15 +34,10 @@ class GraphTest : public CommandTest {
   }
   [[nodiscard]] std::string Graph(const Arguments& more = {}) const { return Done(Verb(more)).out; }
 
-  // Puts a program "dot" of this text alone into PATH.
+  // With a program "dot" of this text, or none.
   [[nodiscard]] Result WithDot(const std::string& script, const Arguments& more) const {
-    const std::string bin = Path("bin");
-    fs::create_directories(bin);
-    if (!script.empty()) {
-      StandIn::WriteBytes(bin + "/dot", "#!/bin/sh\n" + script);
-      fs::permissions(bin + "/dot", fs::perms::owner_all);
-    }
-    return Command(Verb(more), [&] { setenv("PATH", bin.c_str(), 1); });
+    const StandInDot dot(script);
+    return Command(Verb(more));
   }
 };
 

@@ -4,7 +4,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "tests/tools/graph/some_policy.h"
+#include "tests/tools/some_policy.h"
 
 namespace SecPolicyTool {
 namespace {

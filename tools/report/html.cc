@@ -1,0 +1,75 @@
+#include "tools/report/html.h"
+
+#include <utility>
+
+#include "tools/report/visible_text.h"
+
+namespace SecPolicyTool {
+
+namespace {
+
+std::string Escaped(const std::string& text) {
+  std::string escaped;
+  for (const char c : VisibleText(text)) {
+    switch (c) {
+      case '&':
+        escaped += "&amp;";
+        break;
+      case '<':
+        escaped += "&lt;";
+        break;
+      case '>':
+        escaped += "&gt;";
+        break;
+      case '"':
+        escaped += "&quot;";
+        break;
+      case '\'':
+        escaped += "&#39;";
+        break;
+      default:
+        escaped += c;
+    }
+  }
+  return escaped;
+}
+
+std::string StartTag(const char* tag, const std::vector<Attribute>& attributes) {
+  std::string start = std::string("<") + tag;
+  for (const Attribute& attribute : attributes) {
+    start += std::string(" ") + attribute.name + "=\"" + Escaped(attribute.value) + "\"";
+  }
+  return start + ">";
+}
+
+}  // namespace
+
+Html::Html(const std::string& text) : markup_(Escaped(text)) {}
+
+Html Html::TrustedMarkup(std::string markup) {
+  Html html;
+  html.markup_ = std::move(markup);
+  return html;
+}
+
+Html& Html::operator+=(const Html& next) {
+  markup_ += next.markup_;
+  return *this;
+}
+
+Html operator+(Html first, const Html& second) { return std::move(first += second); }
+
+Html Element(const char* tag, const std::vector<Attribute>& attributes, const Html& content) {
+  std::string markup = StartTag(tag, attributes);
+  markup += content.Markup();
+  markup += std::string("</") + tag + ">";
+  return Html::TrustedMarkup(std::move(markup));
+}
+
+Html Element(const char* tag, const Html& content) { return Element(tag, {}, content); }
+
+Html VoidElement(const char* tag, const std::vector<Attribute>& attributes) {
+  return Html::TrustedMarkup(StartTag(tag, attributes));
+}
+
+}  // namespace SecPolicyTool

@@ -1,0 +1,83 @@
+#include "tools/report/report_parts.h"
+
+namespace SecPolicyTool {
+
+namespace {
+
+Html LinkTo(const std::string& id, const std::string& name) {
+  return id.empty() ? Html(name) : Element("a", {{"href", "#" + id}}, name);
+}
+
+}  // namespace
+
+bool IsLabel(RuleType type, std::size_t word) {
+  return InfoOf(type).words.at(word).list == StandIn::WordList::kObjects;
+}
+
+Anchors::Anchors(const Policy& policy, const TransitionGraph& graph) : graph_(graph) {
+  AddLabels(policy);
+  std::size_t number = 0;
+  for (auto& [name, place] : labels_) place = number++;
+}
+
+void Anchors::AddLabels(const Policy& policy) {
+  for (const auto& [name, object] : policy.objects) labels_[name];
+  for (const auto& [name, domain] : policy.domains) {
+    for (const PolicyRule& rule : domain.rules) {
+      for (std::size_t word = 0; word < rule.key.words.size(); ++word) {
+        if (IsLabel(rule.key.type, word)) labels_[rule.key.words[word]];
+      }
+    }
+  }
+  for (const auto* files : {&policy.files, &policy.tardisks}) {
+    for (const auto& [path, file] : *files) {
+      if (!file.label.empty()) labels_[file.label];
+    }
+  }
+}
+
+std::string Anchors::OfDomain(const std::string& name) const {
+  const auto domain = graph_.Find(name);
+  return domain ? "domain-" + std::to_string(*domain) : "";
+}
+
+std::string Anchors::OfLabel(const std::string& name) const {
+  const auto label = labels_.find(name);
+  return label == labels_.end() ? "" : "label-" + std::to_string(label->second);
+}
+
+std::string Anchors::OfFiles(const std::string& label) const {
+  const auto known = labels_.find(label);
+  return known == labels_.end() ? "files-unnamed" : "files-" + std::to_string(known->second);
+}
+
+Html Anchors::Domain(const std::string& name) const { return LinkTo(OfDomain(name), name); }
+
+Html Anchors::Label(const std::string& name) const { return LinkTo(OfLabel(name), name); }
+
+Html PlaceHtml(const std::optional<Place>& place, const std::string& file) {
+  if (!place) return {};
+  Place shown = *place;
+  if (shown.line != 0 && shown.file == file) {
+    shown.file.clear();
+    shown.column = 0;
+  }
+  return Element("small", PlaceText(shown));
+}
+
+std::string Counted(std::size_t count, const std::string& what) {
+  return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
+}
+
+Html Section(const char* id, const std::string& title, const Html& content) {
+  const std::string heading = std::string(id) + "-title";
+  return Element("section", {{"id", id}, {"aria-labelledby", heading}},
+                 Element("h2", {{"id", heading}}, title) + content);
+}
+
+Html Entry(const std::string& id, const Html& summary, const Html& content) {
+  return Element("details", {{"class", "entry"}, {"id", id}},
+                 Element("summary", summary) + content);
+}
+
+}  // namespace SecPolicyTool
