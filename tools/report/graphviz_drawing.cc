@@ -29,9 +29,9 @@ double BoxWidth(const TransitionGraph& graph, std::size_t domain) {
 // A table of one cell is a caption of a size that no font has a say in.
 std::string CaptionBox(const TransitionGraph& graph, const Link& link) {
   const auto characters = static_cast<double>(CharactersIn(CaptionOf(graph, link)));
-  return "<<table border=\"0\" fixedsize=\"true\" height=\"16\" width=\"" +
+  return R"(<<table border="0" fixedsize="true" height="16" width=")" +
          std::to_string(static_cast<int>(characters * kCaptionWidth + 10)) +
-         "\"><tr><td></td></tr></table>>";
+         R"("><tr><td></td></tr></table>>)";
 }
 
 // The graph without its words.
