@@ -16,6 +16,7 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
       "3 the load was terminated because a domain that the host needs is missing.");
   AddLoad(app, status);
   AddShow(app, status);
+  AddCheck(app, status);
   AddDigest(app, status);
   AddDiff(app, status);
   AddSearch(app, status);

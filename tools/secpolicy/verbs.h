@@ -11,6 +11,7 @@ namespace SecPolicyTool {
 // `status`; what it throws is reported by main and ends the command with kFailed.
 void AddCompletion(CLI::App& app, ExitStatus& status);
 void AddDiff(CLI::App& app, ExitStatus& status);
+void AddCheck(CLI::App& app, ExitStatus& status);
 void AddDigest(CLI::App& app, ExitStatus& status);
 void AddDomain(CLI::App& app, ExitStatus& status);
 void AddFiles(CLI::App& app, ExitStatus& status);

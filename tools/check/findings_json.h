@@ -1,0 +1,17 @@
+// Findings as JSON, to be carried from one process to another. Its strings hold the bytes as they
+// are.
+#pragma once
+
+#include <nlohmann/json.hpp>
+#include <vector>
+
+#include "tools/check/finding.h"
+
+namespace SecPolicyTool {
+
+nlohmann::json ToJson(const std::vector<Finding>& findings);
+
+// The findings that ToJson made this of.
+std::vector<Finding> FindingsOfJson(const nlohmann::json& json);
+
+}  // namespace SecPolicyTool
