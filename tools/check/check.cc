@@ -56,16 +56,21 @@ struct CheckedPolicy {
   }
 };
 
+bool Exists(const std::string& path) {
+  std::error_code ignored;
+  return std::filesystem::exists(path, ignored);
+}
+
 CheckedPolicy ReadAll(const CheckedPlace& place, Findings& findings) {
   CheckedPolicy policy;
   policy.objects = ReadDirectory(place.Below("objects"), findings);
   policy.domains = ReadDirectory(place.Below("domains"), findings);
   policy.fileLabels = ReadDirectory(place.Below("fileLabels"), findings);
-  if (std::filesystem::exists(kTardiskPolicyDir)) {
+  if (Exists(kTardiskPolicyDir)) {
     policy.tardisks = ReadDirectory({kTardiskPolicyDir, kTardiskPolicyDir, true}, findings);
   }
   const DirectoryToRead own = place.Below("tardisks");
-  if (own.path != kTardiskPolicyDir && std::filesystem::exists(own.path)) {
+  if (own.path != kTardiskPolicyDir && Exists(own.path)) {
     findings.AddWarning(Kind::kSkippedEntry, {{own.shown, 0, 0}, 0, {}},
                         std::string("a load reads tardisk policy from the host's own ") +
                             kTardiskPolicyDir + ", and not from here",

@@ -74,6 +74,7 @@ void AddCheck(CLI::App& app, ExitStatus& status) {
   AddHostOption(*verb, arguments->host);
   AddJsonOption(*verb, arguments->isJson);
   verb->add_option("--format", arguments->format, "The form of the findings")
+      ->excludes("--json")
       ->type_name("text|json|sarif")
       ->check(CLI::IsMember({"text", "json", "sarif"}));
   verb->add_option("--no-warn", arguments->silenced, "Leave out the warnings of this id")

@@ -103,6 +103,8 @@ TEST_F(ConsistencyTest, RulesOfWords) {
 }
 
 TEST_F(ConsistencyTest, PathRules) {
+  // No relative path is to lead anywhere.
+  std::filesystem::remove(Host() + "/root/etc/hosts");
   CheckLines("domains/appDom", SecPolicyTest::PathLines(), 400);
 }
 
@@ -148,9 +150,7 @@ class LayoutTest : public ConsistencyTest {
     for (std::size_t i = 0; i < cases.size(); i += step) {
       const std::string name = "x" + std::to_string(i);
       Policy("domains/" + name, cases[i].text);
-      expected["domains/" + name] =
-          Replaced(Replaced(cases[i].error, "domain: appDom", "domain: " + name), "\"appDom\"",
-                   "\"" + name + "\"");
+      expected["domains/" + name] = Replaced(cases[i].error, "domain: appDom", "domain: " + name);
     }
     const auto reported = ReportedErrors();
     for (const auto& [file, error] : expected) {

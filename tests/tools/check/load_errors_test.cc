@@ -80,7 +80,7 @@ TEST(LoadErrors, SummariesWithoutACauseAreKept) {
   EXPECT_THAT(Unexplained({"There were some problems encountered in setting the policy"}),
               ElementsAre(" There were some problems encountered in setting the policy"));
   EXPECT_THAT(Unexplained({"Error parsing file /p/fileLabels/base"}),
-              ElementsAre(" Error parsing file /p/fileLabels/base"));
+              ElementsAre("shown/base Error parsing file /p/fileLabels/base"));
 }
 
 TEST(LoadErrors, ExplainedErrorsAreNotRepeated) {

@@ -102,7 +102,7 @@ TEST_F(ReportFormsTest, TextHasTheLineAndTheMark) {
             "  -s  opne\\x09grant Grant\n"
             "          ^~~~\n"
             "help: use spaces\n"
-            "domains/appDom:1:19: error: invalid keyword Grant [bad-decision]\n"
+            "domains/appDom:1:16: error: invalid keyword Grant [bad-decision]\n"
             "  -s  opne\\x09grant Grant\n"
             "                    ^~~~~\n"
             "help: did you mean \"grant\"?\n"
@@ -191,7 +191,8 @@ TEST_F(ReportFormsTest, SarifIsAsTheStandardHasIt) {
   const json& results = run["results"];
   ASSERT_EQ(results.size(), 2U);
   const json& rules = run["tool"]["driver"]["rules"];
-  for (const json& one : results) EXPECT_EQ(rules.at(one["ruleIndex"])["id"], one["ruleId"]);
+  for (const json& one : results)
+    EXPECT_EQ(rules.at(one["ruleIndex"].get<std::size_t>())["id"], one["ruleId"]);
   const json& word = results[0]["locations"][0]["physicalLocation"];
   EXPECT_EQ(results[0]["level"], "error");
   EXPECT_EQ(word["artifactLocation"],
@@ -272,6 +273,7 @@ TEST_F(ReportFormsTest, WrongUsage) {
                                      "carriage-return, contradictory-rule, "));
   EXPECT_EQ(Check({"--no-warn", "unknown-word"}).status, 2);
   EXPECT_EQ(Check({"--format", "xml"}).status, 2);
+  EXPECT_EQ(Check({"--json", "--format", "text"}).status, 2);
 }
 
 TEST_F(ReportFormsTest, DirectoryThatIsNotThere) {

@@ -77,6 +77,7 @@ TEST_F(TardiskLinesTest, TwoFilesOfOneTardisk) {
 
 TEST_F(TardiskLinesTest, FileOfNoTardiskAndDirectory) {
   MakeHostWith("-E conf appDom\n");
+  Policy("fileLabels/base", "");
   const std::string dir = Host() + "/root" + kDir;
   StandIn::WriteBytes(dir + "alien", "-E cnof appDom\n");
   std::filesystem::create_directory(dir + "sub");
