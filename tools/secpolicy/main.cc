@@ -12,23 +12,23 @@ void AddVerbs(CLI::App& app, ExitStatus& status) {
   app.require_subcommand(1);
   app.set_version_flag("--version", std::string("secpolicy ") + SECPOLICY_VERSION);
   app.footer(
-      "Exit status: 0 done, 1 the policy or the request failed, 2 wrong usage,\n"
+      "Exit status: 0 done, or yes; 1 the policy or the request failed, or no; 2 wrong usage;\n"
       "3 the load was terminated because a domain that the host needs is missing.");
   AddLoad(app, status);
   AddShow(app, status);
   AddCheck(app, status);
-  AddDigest(app, status);
   AddDiff(app, status);
   AddSearch(app, status);
   AddMay(app, status);
   AddWho(app, status);
   AddTest(app, status);
-  AddLabel(app, status);
-  AddDomain(app, status);
-  AddFiles(app, status);
   AddGraph(app, status);
   AddPaths(app, status);
   AddReport(app, status);
+  AddDigest(app, status);
+  AddLabel(app, status);
+  AddDomain(app, status);
+  AddFiles(app, status);
   CLI::App* host = app.add_subcommand("host", "Make, assemble and inspect host directories");
   host->require_subcommand(1);
   AddHostInit(*host, status);
