@@ -24,7 +24,7 @@ TEST_F(UsageTest, HelpIsPrintedForEveryVerb) {
     const char* contains;
   };
   for (const Row& row :
-       {Row{{"--help"}, "Exit status: 0 done, 1 the policy or the request failed, 2 wrong usage"},
+       {Row{{"--help"}, "Exit status: 0 done, or yes; 1 the policy or the request failed"},
         Row{{"-h"}, "load  "}, Row{{"load", "--help"}, "--fail OPERATION[:N]"},
         Row{{"show", "--help"}, "DOMAIN-ID"}, Row{{"host", "--help"}, "assemble  "},
         Row{{"host", "init", "--help"}, "The directory to make"},
