@@ -8,6 +8,9 @@ namespace {
 // Beyond that, lines are a texture, and elements a burden.
 constexpr std::size_t kMostSeparateLinks = 3000;
 
+constexpr double kPageWidth = 1220;
+constexpr double kPageHeight = 1600;
+
 std::string Moved(const Point& point, double turn = 0) {
   const std::string moved = "translate(" + SvgNumber(point.x) + " " + SvgNumber(point.y) + ")";
   return turn == 0 ? moved : moved + " rotate(" + SvgNumber(turn) + ")";
@@ -95,6 +98,13 @@ Html DomainHtml(const ReportContext& context, const DrawnDomain& drawn) {
       Element("title", whole) + (drawn.width == 0 ? Dot(drawn, name) : Box(drawn, name)));
 }
 
+// A drawing that is bigger than a page is fitted into one unless this is switched on.
+Html SizeSwitch(const Drawing& drawing) {
+  if (drawing.width <= kPageWidth && drawing.height <= kPageHeight) return {};
+  return Element("label", {{"class", "size"}},
+                 VoidElement("input", {{"type", "checkbox"}}) + " Full size");
+}
+
 Html DrawingHtml(const ReportContext& context) {
   const Drawing& drawing = context.report.drawing;
   Html content = Element("defs", Arrowhead("arrow") + Arrowhead("arrow-marked"));
@@ -109,7 +119,12 @@ Html DrawingHtml(const ReportContext& context) {
                             {"role", "group"},
                             {"aria-label", "Transitions between domains"}},
                            content);
-  return Element("div", {{"class", "drawing"}, {"tabindex", "0"}}, svg);
+  return SizeSwitch(drawing) + Element("div",
+                                       {{"class", "drawing"},
+                                        {"role", "region"},
+                                        {"aria-label", "Drawing of the transitions"},
+                                        {"tabindex", "0"}},
+                                       svg);
 }
 
 Html Loners(const ReportContext& context) {

@@ -83,6 +83,19 @@ def make_hostile_policy(directory: pathlib.Path) -> pathlib.Path:
     return policy
 
 
+def make_ring(directory: pathlib.Path) -> pathlib.Path:
+    """A policy of so many domains that their drawing is bigger than a page."""
+    policy = directory / "ring"
+    for name in ("objects", "domains", "fileLabels"):
+        (policy / name).mkdir(parents=True)
+    (policy / "objects" / "base").write_text("next\nvendorTardisk\nstorageTardisk\n")
+    for name in ("appDom", "globalVMDom", "ioFilterDom", "vendorDom", "storageDom"):
+        (policy / "domains" / name).write_text("")
+    for i in range(400):
+        (policy / "domains" / f"ring{i}").write_text(f"-d next ring{(i + 1) % 400} exec grant\n")
+    return policy
+
+
 def open_browser(profile: pathlib.Path) -> webdriver.Chrome:
     options = Options()
     options.binary_location = BROWSER
@@ -105,6 +118,8 @@ class ReportInABrowser(unittest.TestCase):
             PATH=str(cls.directory))
         run(COMMAND, "report", "--host", host, make_hostile_policy(cls.directory),
             "-o", cls.directory / "hostile.html")
+        run(COMMAND, "report", "--host", host, make_ring(cls.directory),
+            "-o", cls.directory / "ring.html")
         cls.browser = open_browser(cls.directory / "profile")
         cls.addClassCleanup(cls.browser.quit)
 
@@ -242,6 +257,14 @@ class ReportInABrowser(unittest.TestCase):
         self.assertEqual(names, {"netDom", "rootDom", "firewallDom"})
         node.click()
         self.wait(lambda: self.domain("netDom").get_attribute("open") == "true")
+
+    def test_big_drawing_fits_until_it_is_asked_for_in_full(self) -> None:
+        self.open("ring")
+        drawing = self.one("#graph svg")
+        self.assertLess(drawing.size["width"], 1280)
+        self.assertLess(drawing.size["height"], 1000)
+        self.one("#graph input").click()
+        self.assertGreater(drawing.size["width"], 2000)
 
     def test_words_of_a_policy_do_nothing(self) -> None:
         self.open("hostile")

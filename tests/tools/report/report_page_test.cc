@@ -162,6 +162,9 @@ TEST(ReportPageTest, TooManyLinksAreDrawnAsOne) {
   EXPECT_EQ(CountOf(page, "class=\"link\""), 0U);
   EXPECT_EQ(CountOf(page, "class=\"texture\""), 1U);
   EXPECT_EQ(CountOf(page, "class=\"node\""), 61U);
+  EXPECT_THAT(page, Not(HasSubstr("Full size")));
+  report.drawing.width = 2000;
+  EXPECT_THAT(ReportPage(report), HasSubstr("<input type=\"checkbox\"> Full size</label>"));
 }
 
 TEST(ReportPageTest, SameReportGivesTheSameBytes) {

@@ -35,7 +35,7 @@ TEST_F(ReportTest, WritesAPage) {
   EXPECT_THAT(page, StartsWith("<!DOCTYPE html>\n<html lang=\"en\">"));
   EXPECT_THAT(page, HasSubstr("<h3>appDom</h3>"));
   EXPECT_THAT(page, HasSubstr("<small>line 1</small>"));
-  EXPECT_THAT(page, HasSubstr("A check of its files finds nothing."));
+  EXPECT_THAT(page, HasSubstr("<h2 id=\"findings-title\">Findings</h2>"));
 }
 
 TEST_F(ReportTest, SamePolicyGivesTheSameBytes) {
@@ -71,16 +71,23 @@ TEST_F(ReportTest, FailureOfGraphvizIsAWarning) {
 }
 
 TEST_F(ReportTest, JsonIsAsDescribed) {
-  for (const auto& [source, findings] :
-       std::vector<std::pair<std::string, nlohmann::json>>{{PolicyDir(), 0}, {"kernel", nullptr}}) {
-    const std::string text = Done(Verb(source, {"--json"})).out;
-    EXPECT_EQ(JsonProblem(text, "report"), "");
-    const auto json = nlohmann::json::parse(text);
-    EXPECT_EQ(json["file"], Page());
-    EXPECT_EQ(json["findings"], findings);
-    EXPECT_EQ(json["sha256"].get<std::string>() + "\n",
-              Done({"digest", "--host", Host(), source}).out);
-  }
+  Policy("domains/appDom", "-s read grant\n-x\n");
+  const auto json = nlohmann::json::parse(Done(Verb(PolicyDir(), {"--json"})).out);
+  EXPECT_EQ(JsonProblem(json.dump(), "report"), "");
+  EXPECT_EQ(json["source"], PolicyDir());
+  EXPECT_EQ(json["file"], Page());
+  EXPECT_GT(json["findings"], 0);
+  EXPECT_THAT(StandIn::ReadBytes(Page()),
+              HasSubstr("<b>" + json["findings"].dump() + "</b><span>findings</span>"));
+}
+
+TEST_F(ReportTest, JsonOfAKernelHasNoFindings) {
+  const std::string text = Done(Verb("kernel", {"--json"})).out;
+  EXPECT_EQ(JsonProblem(text, "report"), "");
+  const auto json = nlohmann::json::parse(text);
+  EXPECT_EQ(json["findings"], nullptr);
+  EXPECT_EQ(json["sha256"].get<std::string>() + "\n",
+            Done({"digest", "--host", Host(), "kernel"}).out);
 }
 
 TEST_F(ReportTest, PageThatCannotBeWritten) {
