@@ -1,3 +1,5 @@
+#include <map>
+
 #include "tools/report/sections.h"
 #include "tools/report/visible_text.h"
 
@@ -53,15 +55,22 @@ Html LinkHtml(const TransitionGraph& graph, const DrawnLink& drawn) {
                  content);
 }
 
-Html LinksHtml(const TransitionGraph& graph, const Drawing& drawing) {
-  Html links;
-  if (drawing.links.size() <= kMostSeparateLinks) {
-    for (const DrawnLink& drawn : drawing.links) links += LinkHtml(graph, drawn);
-    return links;
+// The links that leave each domain as one path.
+Html Texture(const TransitionGraph& graph, const Drawing& drawing) {
+  std::map<std::size_t, std::string> paths;
+  for (const DrawnLink& drawn : drawing.links) paths[graph.Links()[drawn.link].from] += drawn.path;
+  Html texture;
+  for (const auto& [from, path] : paths) {
+    texture += Element("path", {{"data-from", std::to_string(from)}, {"d", path}}, {});
   }
-  std::string all;
-  for (const DrawnLink& drawn : drawing.links) all += drawn.path;
-  return Element("g", {{"class", "texture"}}, Element("path", {{"d", all}}, {}));
+  return Element("g", {{"class", "texture"}}, texture);
+}
+
+Html LinksHtml(const TransitionGraph& graph, const Drawing& drawing) {
+  if (drawing.links.size() > kMostSeparateLinks) return Texture(graph, drawing);
+  Html links;
+  for (const DrawnLink& drawn : drawing.links) links += LinkHtml(graph, drawn);
+  return links;
 }
 
 Html Box(const DrawnDomain& drawn, const std::string& name) {

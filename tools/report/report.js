@@ -138,7 +138,8 @@
   if (!drawing) return;
   const nodes = new Map();
   for (const node of drawing.querySelectorAll('.node')) nodes.set(node.dataset.domain, node);
-  const links = [...drawing.querySelectorAll('.link')];
+  // Of very many links, those that leave a domain are one line, which does not say where to.
+  const links = [...drawing.querySelectorAll('.link, .texture path')];
 
   const unmark = () => {
     drawing.classList.remove('marking');
@@ -147,7 +148,7 @@
   const mark = (event) => {
     unmark();
     const node = event.target.closest('.node');
-    if (!node || links.length === 0) return;
+    if (!node) return;
     drawing.classList.add('marking');
     node.classList.add('marked');
     for (const link of links) {
@@ -155,7 +156,7 @@
       if (from !== node.dataset.domain && to !== node.dataset.domain) continue;
       link.classList.add('marked');
       nodes.get(from).classList.add('marked');
-      nodes.get(to).classList.add('marked');
+      if (to) nodes.get(to).classList.add('marked');
     }
   };
   drawing.addEventListener('mouseover', mark);

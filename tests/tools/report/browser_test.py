@@ -83,16 +83,17 @@ def make_hostile_policy(directory: pathlib.Path) -> pathlib.Path:
     return policy
 
 
-def make_ring(directory: pathlib.Path) -> pathlib.Path:
-    """A policy of so many domains that their drawing is bigger than a page."""
-    policy = directory / "ring"
+def make_ring(directory: pathlib.Path, size: int, reach: int) -> pathlib.Path:
+    """A policy of so many domains, each of which goes to so many next ones."""
+    policy = directory / f"ring{size}"
     for name in ("objects", "domains", "fileLabels"):
         (policy / name).mkdir(parents=True)
     (policy / "objects" / "base").write_text("next\nvendorTardisk\nstorageTardisk\n")
     for name in ("appDom", "globalVMDom", "ioFilterDom", "vendorDom", "storageDom"):
         (policy / "domains" / name).write_text("")
-    for i in range(400):
-        (policy / "domains" / f"ring{i}").write_text(f"-d next ring{(i + 1) % 400} exec grant\n")
+    for i in range(size):
+        (policy / "domains" / f"ring{i}").write_text("".join(
+            f"-d next ring{(i + step) % size} exec grant\n" for step in range(1, reach + 1)))
     return policy
 
 
@@ -118,8 +119,9 @@ class ReportInABrowser(unittest.TestCase):
             PATH=str(cls.directory))
         run(COMMAND, "report", "--host", host, make_hostile_policy(cls.directory),
             "-o", cls.directory / "hostile.html")
-        run(COMMAND, "report", "--host", host, make_ring(cls.directory),
-            "-o", cls.directory / "ring.html")
+        for page, size, reach in (("ring", 400, 1), ("dense", 60, 55)):
+            run(COMMAND, "report", "--host", host, make_ring(cls.directory, size, reach),
+                "-o", cls.directory / f"{page}.html")
         cls.browser = open_browser(cls.directory / "profile")
         cls.addClassCleanup(cls.browser.quit)
 
@@ -248,15 +250,30 @@ class ReportInABrowser(unittest.TestCase):
                 self.assertGreater(node.size["width"], 0)
         self.assertEqual(len(self.all("#graph svg .node circle")), len(nodes))
 
-    def test_graph_shows_what_a_domain_is_linked_to(self) -> None:
+    def node(self, name: str):
         [node] = [node for node in self.all("#graph svg .node")
-                  if node.find_element(By.TAG_NAME, "text").text == "netDom"]
-        self.run_script("arguments[0].focus()", node)
-        names = {node.find_element(By.TAG_NAME, "text").text
-                 for node in self.all("#graph svg .node.marked")}
-        self.assertEqual(names, {"netDom", "rootDom", "firewallDom"})
-        node.click()
+                  if node.find_element(By.TAG_NAME, "text").text == name]
+        return node
+
+    def marked(self) -> set[str]:
+        return {node.find_element(By.TAG_NAME, "text").text
+                for node in self.all("#graph svg .node.marked")}
+
+    def test_graph_shows_what_a_domain_is_linked_to(self) -> None:
+        self.run_script("arguments[0].focus()", self.node("netDom"))
+        self.assertEqual(self.marked(), {"netDom", "rootDom", "firewallDom"})
+        self.node("netDom").click()
         self.wait(lambda: self.domain("netDom").get_attribute("open") == "true")
+
+    def test_graph_of_very_many_links_shows_those_that_leave_a_domain(self) -> None:
+        self.open("dense")
+        self.assertEqual(self.all("#graph .link"), [])
+        node = self.node("ring7")
+        self.run_script("arguments[0].focus()", node)
+        [line] = self.all("#graph .texture .marked")
+        self.assertEqual(line.get_attribute("data-from"), node.get_attribute("data-domain"))
+        self.assertEqual(line.get_attribute("d").count("M"), 55)
+        self.assertEqual(self.marked(), {"ring7"})
 
     def test_big_drawing_fits_until_it_is_asked_for_in_full(self) -> None:
         self.open("ring")
