@@ -17,6 +17,8 @@ struct ReportContext {
 Html OverviewSection(const ReportContext& context);
 Html FindingsSection(const ReportContext& context);
 Html GraphSection(const ReportContext& context);
+// The drawing of that section; its domains link to their entries.
+Html DrawingSvg(const ReportContext& context);
 Html DomainsSection(const ReportContext& context);
 Html LabelsSection(const ReportContext& context);
 Html FilesSection(const ReportContext& context);
