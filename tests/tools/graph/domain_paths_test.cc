@@ -13,7 +13,6 @@ namespace {
 
 using testing::ElementsAre;
 using testing::ElementsAreArray;
-using testing::IsEmpty;
 
 std::string Name(const TransitionGraph& graph, const DomainPath& path) {
   std::string name;

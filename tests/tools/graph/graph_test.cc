@@ -11,7 +11,6 @@ namespace SecPolicyTool {
 namespace {
 
 namespace fs = std::filesystem;
-using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::Not;
 using testing::StartsWith;

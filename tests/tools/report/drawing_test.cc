@@ -95,7 +95,7 @@ TEST(DrawingTest, CircleHoldsEverything) {
 }
 
 TEST(DrawingTest, NeighboursOnTheCircleDoNotTouch) {
-  for (const std::size_t count : {2, 3, 40, 1000}) {
+  for (const std::size_t count : std::vector<std::size_t>{2, 3, 40, 1000}) {
     const TransitionGraph graph = BigGraph(count, count);
     const Drawing drawing = DrawCircle(graph);
     ExpectWhole(graph, drawing);
