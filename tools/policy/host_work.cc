@@ -112,13 +112,13 @@ HostWork WorkInHost(StandIn::HostDirectory host, StandIn::SessionOptions options
     throw std::runtime_error(std::string("the work in the host was killed (") +
                              strsignal(WTERMSIG(status)) + ")");
   }
-  const json content = letter.Read();
+  json content = letter.Read();
   if (content.contains("failure")) {
     throw std::runtime_error(content["failure"].get_ref<const std::string&>());
   }
   outcome.wasTerminated = WEXITSTATUS(status) == kTerminated;
   if (content.contains("result")) {
-    outcome.result = content["result"];
+    outcome.result = std::move(content["result"]);
   } else if (!outcome.errors.empty()) {
     throw std::runtime_error(outcome.errors.back());
   }
