@@ -71,7 +71,7 @@ CheckedPolicy ReadAll(const CheckedPlace& place, Findings& findings) {
   }
   const DirectoryToRead own = place.Below("tardisks");
   if (own.path != kTardiskPolicyDir && Exists(own.path)) {
-    findings.AddWarning(Kind::kSkippedEntry, {{own.shown, 0, 0}, 0, {}},
+    findings.AddWarning(Kind::kSkippedEntry, SpotOf(own.shown),
                         std::string("a load reads tardisk policy from the host's own ") +
                             kTardiskPolicyDir + ", and not from here",
                         "its lines are checked all the same; pack the files into their tardisks");
@@ -121,12 +121,12 @@ CheckReport CheckWholePolicy(HostDirectory host, const std::string& dir) {
       throw;
     }
   };
-  const HostWork outcome =
+  HostWork outcome =
       WorkInHost(std::move(host), TrialOptions(location), load, [&](Session& session) {
         errors.End();
         return CheckAfter(errors.Errors(), place, image, session.Module());
       });
-  return {FindingsOfJson(outcome.result.at(1)), outcome.result.at(0)};
+  return {FindingsOfJson(std::move(outcome.result.at(1))), outcome.result.at(0)};
 }
 
 std::vector<Finding> CheckPolicy(HostDirectory host, const std::string& dir) {

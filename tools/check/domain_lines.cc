@@ -1,52 +1,18 @@
 #include "tools/check/domain_lines.h"
 
-#include <cctype>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <memory>
-#include <optional>
 
-#include "host/module/nearest_word.h"
 #include "secpolicy/secpolicy.h"
 #include "tools/check/permission_words.h"
+#include "tools/check/rule_helps.h"
 #include "tools/check/rule_memory.h"
 
 namespace SecPolicyTool {
 
 namespace {
-
-// "-s SYSTEM-CALL grant|revoke", as a help.
-std::string FormOf(const RuleTypeInfo& info) {
-  std::string form = std::string("write: ") + info.keyword;
-  for (const RuleWordInfo& word : info.words) {
-    form += " ";
-    for (const char* c = word.name; *c != '\0'; ++c) {
-      form += *c == ' ' || *c == '\'' ? '-' : static_cast<char>(std::toupper(*c));
-    }
-  }
-  return form + (info.kind ? " grant|revoke" : " [r][w][x]");
-}
-
-// The rule type of which a word has the letter, whatever else it has; or else all of them.
-std::string HelpForType(const std::string& word) {
-  std::string letters;
-  for (const char c : word) {
-    if (std::isalnum(static_cast<unsigned char>(c)) != 0) {
-      letters += static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
-    }
-  }
-  if (TypeOfKeyword("-" + letters)) return "did you mean \"-" + letters + "\"?";
-  if (letters == "e") return "-E stands in the policy files of tardisks";
-  std::string help = "the rule types are";
-  for (const RuleTypeInfo& info : RuleTypes()) help += std::string(" ") + info.keyword;
-  return help;
-}
-
-std::string HelpForDecision(const std::string& word) {
-  const auto nearest = StandIn::NearestWord(word, {"grant", "revoke"});
-  return nearest ? "did you mean \"" + *nearest + "\"?" : "a rule ends in grant or revoke";
-}
 
 // One file's lines, from the first to the last.
 class DomainFile {
@@ -112,7 +78,7 @@ void DomainFile::CheckLine(const PolicyLine& line) {
   const std::size_t most = info.words.size() + 1;
   if (count > most || count < (info.kind ? most : most - 1)) {
     Refuse(Kind::kWordCount, line, SpotOf(file_, line), TextOfRefusal(SecPolicy::RuleSizeError),
-           FormOf(info));
+           HelpForCount(info));
   } else if (info.kind) {
     CheckKeywordRule(line, *type);
   } else {

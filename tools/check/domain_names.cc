@@ -40,7 +40,7 @@ void CheckRequired(const RequiredDomain& required, const CheckedDirectory& domai
   const std::string wanted = domains.shown + "/" + required.name;
   const auto nearest = StandIn::NearestWord(required.name, names);
   context.findings.AddError(
-      Kind::kMissingDomain, {{domains.shown, 0, 0}, 0, {}},
+      Kind::kMissingDomain, SpotOf(domains.shown),
       std::string("the domain \"") + required.name + "\" is missing, so a load is terminated",
       required.loadMessage,
       nearest ? "is " + domains.shown + "/" + *nearest + " to be named " + required.name + "?"

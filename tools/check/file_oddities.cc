@@ -13,10 +13,7 @@ std::string Counted(std::size_t count, const char* one, const char* more) {
 void CheckLength(const CheckedFile& file, const PolicyLine& line, Findings& findings) {
   if (line.whole.size() <= kLongestLine) return;
   const std::size_t cut = line.whole.size() - kLongestLine;
-  findings.AddWarning(Kind::kLongLine,
-                      {{file.shown, line.number, static_cast<unsigned int>(kLongestLine + 1)},
-                       static_cast<unsigned int>(cut),
-                       line.whole},
+  findings.AddWarning(Kind::kLongLine, SpotAt(file, line, kLongestLine + 1, cut),
                       "the line has " + std::to_string(line.whole.size()) +
                           " bytes, of which a load reads 1023; ignored are the last " +
                           Counted(cut, "byte", "bytes") + " and " +
@@ -29,8 +26,7 @@ void CheckNul(const CheckedFile& file, const PolicyLine& line, Findings& finding
   const std::string read = line.whole.substr(0, std::min(kLongestLine, line.whole.find('#')));
   const std::size_t at = read.find('\0');
   if (at == std::string::npos) return;
-  findings.AddWarning(Kind::kNulByte,
-                      {{file.shown, line.number, static_cast<unsigned int>(at + 1)}, 1, line.whole},
+  findings.AddWarning(Kind::kNulByte, SpotAt(file, line, at + 1, 1),
                       "a NUL byte ends the line; what follows it is ignored", "remove the byte");
 }
 
@@ -39,8 +35,7 @@ void CheckByte(const CheckedFile& file, const PolicyLine& line, char byte, Kind 
   for (const LineWord& word : line.words) {
     const std::size_t at = word.text.find(byte);
     if (at == std::string::npos) continue;
-    const auto column = word.column + static_cast<unsigned int>(at);
-    findings.AddWarning(kind, {{file.shown, line.number, column}, 1, line.whole}, message, help);
+    findings.AddWarning(kind, SpotAt(file, line, word.column + at, 1), message, help);
     return;
   }
 }

@@ -6,21 +6,34 @@
 
 namespace SecPolicyTool {
 
-Spot SpotOf(const CheckedFile& file) { return {{file.shown, 0, 0}, 0, {}}; }
+Spot SpotOf(const std::string& shown) {
+  Spot spot;
+  spot.place.file = shown;
+  return spot;
+}
+
+Spot SpotOf(const CheckedFile& file) { return SpotOf(file.shown); }
+
+Spot SpotAt(const CheckedFile& file, const PolicyLine& line, std::size_t column,
+            std::size_t length) {
+  Spot spot = SpotOf(file);
+  spot.place.line = line.number;
+  spot.place.column = static_cast<unsigned int>(column);
+  spot.length = static_cast<unsigned int>(length);
+  spot.source = line.whole;
+  return spot;
+}
 
 Spot SpotFrom(const CheckedFile& file, const PolicyLine& line, std::size_t first) {
-  const LineWord& begin = line.words.at(first);
+  const std::size_t begin = line.words.at(first).column;
   const LineWord& last = line.words.back();
-  const auto end = last.column + static_cast<unsigned int>(last.text.size());
-  return {{file.shown, line.number, begin.column}, end - begin.column, line.whole};
+  return SpotAt(file, line, begin, last.column + last.text.size() - begin);
 }
 
 Spot SpotOf(const CheckedFile& file, const PolicyLine& line) { return SpotFrom(file, line, 0); }
 
 Spot SpotOf(const CheckedFile& file, const PolicyLine& line, const LineWord& word) {
-  return {{file.shown, line.number, word.column},
-          static_cast<unsigned int>(word.text.size()),
-          line.whole};
+  return SpotAt(file, line, word.column, word.text.size());
 }
 
 namespace {
@@ -41,7 +54,6 @@ Finding Make(Kind kind, Severity severity, Spot spot, std::string message, std::
 
 void Findings::AddError(Kind kind, Spot spot, std::string message, std::string loadMessage,
                         std::string help) {
-  loadMessages_.insert(loadMessage);
   findings_.push_back(
       Make(kind, Severity::kError, std::move(spot), std::move(message), std::move(help)));
   findings_.back().loadMessage = std::move(loadMessage);

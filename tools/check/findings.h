@@ -2,7 +2,6 @@
 #pragma once
 
 #include <string>
-#include <unordered_set>
 #include <vector>
 
 #include "tools/check/finding.h"
@@ -18,10 +17,15 @@ struct Spot {
   std::string source;
 };
 
+// A file or a directory, by what its user calls it.
+Spot SpotOf(const std::string& shown);
 Spot SpotOf(const CheckedFile& file);
 // All words of the line.
 Spot SpotOf(const CheckedFile& file, const PolicyLine& line);
 Spot SpotOf(const CheckedFile& file, const PolicyLine& line, const LineWord& word);
+// `length` bytes from `column` on.
+Spot SpotAt(const CheckedFile& file, const PolicyLine& line, std::size_t column,
+            std::size_t length);
 // The words from `first` to the last.
 Spot SpotFrom(const CheckedFile& file, const PolicyLine& line, std::size_t first);
 
@@ -32,17 +36,14 @@ class Findings {
                 std::string help = {});
   void AddWarning(Kind kind, Spot spot, std::string message, std::string help = {});
 
-  // Whether an error stands for what a load reports in these words.
-  [[nodiscard]] bool Explains(const std::string& loadMessage) const {
-    return loadMessages_.contains(loadMessage);
-  }
+  // In the order in which they were added.
+  [[nodiscard]] const std::vector<Finding>& All() const { return findings_; }
 
   // In the order of files, lines and columns; those without a file last.
   [[nodiscard]] std::vector<Finding> Sorted() &&;
 
  private:
   std::vector<Finding> findings_;
-  std::unordered_set<std::string> loadMessages_;
 };
 
 }  // namespace SecPolicyTool

@@ -9,9 +9,9 @@
 
 namespace SecPolicyTool {
 
-nlohmann::json ToJson(const std::vector<Finding>& findings);
+nlohmann::json ToJson(std::vector<Finding> findings);
 
 // The findings that ToJson made this of.
-std::vector<Finding> FindingsOfJson(const nlohmann::json& json);
+std::vector<Finding> FindingsOfJson(nlohmann::json json);
 
 }  // namespace SecPolicyTool

@@ -2,7 +2,9 @@
 #pragma once
 
 #include <string>
+#include <string_view>
 #include <unordered_map>
+#include <unordered_set>
 #include <vector>
 
 #include "tools/check/findings.h"
@@ -38,6 +40,9 @@ class LoadErrors {
                       Findings& findings) const;
 
  private:
+  // The texts that an error among `findings` stands for.
+  [[nodiscard]] std::unordered_set<std::string_view> Explained(const Findings& findings) const;
+
   std::vector<LoadError> errors_;
   std::unordered_map<std::string, std::size_t> places_;  // "FILE:LINE" to the error's index
 };

@@ -42,7 +42,7 @@ const char* NameOfType(const std::string& path) {
 }
 
 void AddSkipped(const DirectoryToRead& directory, const std::string& name, Findings& findings) {
-  const Spot spot{{directory.shown + "/" + name, 0, 0}, 0, {}};
+  const Spot spot = SpotOf(directory.shown + "/" + name);
   const std::string message =
       std::string(NameOfType(directory.path + "/" + name)) + ", which a load passes over";
   const std::string help = "put the file itself here, or remove the entry";
@@ -54,7 +54,7 @@ void AddSkipped(const DirectoryToRead& directory, const std::string& name, Findi
 }
 
 void AddBackup(const std::string& shown, Findings& findings) {
-  findings.AddWarning(Kind::kBackupFile, {{shown, 0, 0}, 0, {}},
+  findings.AddWarning(Kind::kBackupFile, SpotOf(shown),
                       "the name is that of a copy that was left behind, and a load reads the file",
                       "remove it");
 }
@@ -91,11 +91,11 @@ CheckedDirectory ReadDirectory(const DirectoryToRead& directory, Findings& findi
   try {
     names = FilesToRead(directory, findings);
   } catch (const Tavon::Lib::TavonException& failure) {
-    findings.AddError(
-        Kind::kUnreadable, {{directory.shown, 0, 0}, 0, {}}, "the directory cannot be opened",
-        directory.isTardiskPolicy ? "Unable to open policy directory for tardisks " + directory.path
-                                  : failure.what(),
-        "make it; it may be empty");
+    findings.AddError(Kind::kUnreadable, SpotOf(directory.shown), "the directory cannot be opened",
+                      directory.isTardiskPolicy
+                          ? "Unable to open policy directory for tardisks " + directory.path
+                          : failure.what(),
+                      "make it; it may be empty");
     return read;
   }
   for (const std::string& name : names) {
@@ -125,7 +125,7 @@ void CheckTopEntries(const std::string& path, const std::string& shown, Findings
     const auto nearest = StandIn::NearestWord(name, kRead);
     const bool isBeside =
         !nearest || std::find(names.begin(), names.end(), *nearest) != names.end();
-    findings.AddWarning(Kind::kSkippedEntry, {{shown + "/" + name, 0, 0}, 0, {}},
+    findings.AddWarning(Kind::kSkippedEntry, SpotOf(shown + "/" + name),
                         "a load reads nothing of this name",
                         isBeside ? "what is read is objects, domains and fileLabels"
                                  : "did you mean \"" + *nearest + "\"?");

@@ -22,6 +22,7 @@ TEST(LoadErrors, PlaceIsReadFromTheText) {
       {"Error in parsing policy for domain: appDom: 12 : cause", "appDom", 12, "cause"},
       {"Error in setting policy for domain: appDom: 1 : cause", "appDom", 1, "cause"},
       {"Error in parsing policy for domain: /t/x: 1 : cause", "/t/x", 1, "cause"},
+      {"/p : 1/a:3 : cause", "/p : 1/a", 3, "cause"},
       {"no place", "", 0, "no place"},
       {"no line : cause", "", 0, "no line : cause"},
       {"a7 : cause", "", 0, "a7 : cause"},
