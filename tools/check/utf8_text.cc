@@ -74,9 +74,12 @@ std::string Escaped(std::string_view bytes) {
   return text;
 }
 
+bool IsPlain(char c) { return c >= ' ' && c <= '~'; }
+
 }  // namespace
 
 std::string TerminalText(std::string_view text) {
+  if (std::all_of(text.begin(), text.end(), IsPlain)) return std::string(text);
   std::string shown;
   while (!text.empty()) {
     const std::size_t bytes = CharacterBytes(text);
