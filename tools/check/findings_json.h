@@ -11,7 +11,7 @@ namespace SecPolicyTool {
 
 nlohmann::json ToJson(std::vector<Finding> findings);
 
-// The findings that ToJson made this of.
-std::vector<Finding> FindingsOfJson(nlohmann::json json);
+// The findings that ToJson made these of.
+std::vector<Finding> FindingsOfJson(nlohmann::json entries);
 
 }  // namespace SecPolicyTool
