@@ -43,15 +43,16 @@ bool SaysTheSame(const LabelMapping& a, const LabelMapping& b) {
 
 void CheckOverrides(const std::vector<LabelMapping>& mappings, Findings& findings) {
   LaterMappings later;
-  for (auto mapping = mappings.rbegin(); mapping != mappings.rend(); ++mapping) {
-    const LabelMapping* covering = later.Covering(*mapping);
-    later.Add(*mapping);
+  for (std::size_t i = mappings.size(); i-- > 0;) {
+    const LabelMapping& mapping = mappings[i];
+    const LabelMapping* covering = later.Covering(mapping);
+    later.Add(mapping);
     if (covering == nullptr) continue;
-    const Spot spot = SpotOf(*mapping->file, *mapping->line);
-    if (SaysTheSame(*mapping, *covering)) {
+    const Spot spot = SpotOf(*mapping.file, *mapping.line);
+    if (SaysTheSame(mapping, *covering)) {
       findings.AddWarning(Kind::kRepeatedRule, spot, PlaceOf(*covering) + " says the same",
                           "remove one of the two");
-    } else if (LabelOf(*mapping) != LabelOf(*covering)) {
+    } else if (LabelOf(mapping) != LabelOf(*covering)) {
       findings.AddWarning(Kind::kOverriddenLabel, spot,
                           PlaceOf(*covering) + " labels all of it \"" + LabelOf(*covering) + "\"",
                           "remove the line, or put it behind the one that overrides it");

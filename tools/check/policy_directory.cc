@@ -116,6 +116,7 @@ CheckedDirectory ReadDirectory(const DirectoryToRead& directory, Findings& findi
 
 void CheckTopEntries(const std::string& path, const std::string& shown, Findings& findings) {
   static const std::vector<std::string> kRead{"objects", "domains", "fileLabels", "tardisks"};
+  const std::string prefix = shown + "/";
   std::vector<std::string> names = NamesIn(path);
   std::sort(names.begin(), names.end());
   for (const std::string& name : names) {
@@ -125,7 +126,7 @@ void CheckTopEntries(const std::string& path, const std::string& shown, Findings
     const auto nearest = StandIn::NearestWord(name, kRead);
     const bool isBeside =
         !nearest || std::find(names.begin(), names.end(), *nearest) != names.end();
-    findings.AddWarning(Kind::kSkippedEntry, SpotOf(shown + "/" + name),
+    findings.AddWarning(Kind::kSkippedEntry, SpotOf(prefix + name),
                         "a load reads nothing of this name",
                         isBeside ? "what is read is objects, domains and fileLabels"
                                  : "did you mean \"" + *nearest + "\"?");

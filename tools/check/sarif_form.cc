@@ -94,7 +94,7 @@ json ResultOf(const Finding& finding, const std::string& dir) {
               {"ruleIndex", RuleIndex(finding.id)},
               {"level", LevelOf(finding.severity)},
               {"message", Text(finding.message + help)}};
-  if (!finding.place.file.empty()) result["locations"] = {LocationOf(finding, dir)};
+  if (!finding.place.file.empty()) result["locations"] = json::array({LocationOf(finding, dir)});
   if (!finding.loadMessage.empty()) {
     result["properties"] = {{"loadMessage", ValidText(finding.loadMessage)}};
   }
@@ -119,13 +119,14 @@ json SarifForm(const CheckReport& report, const std::string& source) {
   json results = json::array();
   for (const Finding& finding : report.findings) results.push_back(ResultOf(finding, dir));
   const json driver{{"name", "secpolicy"}, {"version", SECPOLICY_VERSION}, {"rules", Rules()}};
+  json run{{"tool", {{"driver", driver}}},
+           {"columnKind", "unicodeCodePoints"},
+           {"originalUriBaseIds", BasesOf(dir)},
+           {"results", std::move(results)}};
+  // Compilers differ in what braces around one value make of it.
   return {{"$schema", "https://json.schemastore.org/sarif-2.1.0.json"},
           {"version", "2.1.0"},
-          {"runs",
-           {{{"tool", {{"driver", driver}}},
-             {"columnKind", "unicodeCodePoints"},
-             {"originalUriBaseIds", BasesOf(dir)},
-             {"results", std::move(results)}}}}};
+          {"runs", json::array({std::move(run)})}};
 }
 
 }  // namespace SecPolicyTool
