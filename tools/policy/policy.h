@@ -64,7 +64,8 @@ struct RuleKey {
   std::vector<std::string> words;
   StandIn::WorldId world = 0;  // of path rules: the one world that it is for; 0 for the domain
 
-  auto operator<=>(const RuleKey&) const = default;
+  // The check takes the compiler's own comparison with 0 for a pointer's.
+  auto operator<=>(const RuleKey&) const = default;  // NOLINT(modernize-use-nullptr)
 };
 
 struct PolicyRule {

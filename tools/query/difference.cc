@@ -8,8 +8,8 @@ namespace SecPolicyTool {
 
 namespace {
 
-// Hands `differ` the name of each entry that is not the same in both maps, and its two contents,
-// nullptr for one that is not there.
+// Hands `differ` the name of each entry that is not the same in both maps, its two contents,
+// nullptr for one that is not there, and the later one of those that are.
 template <typename Map, typename Same, typename Differ>
 void ForEachDifference(const Map& before, const Map& after, const Same& same,
                        const Differ& differ) {
@@ -17,13 +17,15 @@ void ForEachDifference(const Map& before, const Map& after, const Same& same,
   auto now = after.begin();
   while (old != before.end() || now != after.end()) {
     if (now == after.end() || (old != before.end() && old->first < now->first)) {
-      differ(old->first, &old->second, nullptr);
+      differ(old->first, &old->second, nullptr, old->second);
       ++old;
     } else if (old == before.end() || now->first < old->first) {
-      differ(now->first, nullptr, &now->second);
+      differ(now->first, nullptr, &now->second, now->second);
       ++now;
     } else {
-      if (!same(old->second, now->second)) differ(old->first, &old->second, &now->second);
+      if (!same(old->second, now->second)) {
+        differ(old->first, &old->second, &now->second, now->second);
+      }
       ++old;
       ++now;
     }
@@ -40,10 +42,11 @@ std::vector<Named<Content>> CompareNamed(const std::map<std::string, Content>& b
                                          const std::map<std::string, Content>& after,
                                          const Same& same) {
   std::vector<Named<Content>> changes;
-  ForEachDifference(before, after, same,
-                    [&](const std::string& name, const Content* old, const Content* now) {
-                      changes.push_back({name, {Copied(old), Copied(now)}});
-                    });
+  ForEachDifference(
+      before, after, same,
+      [&](const std::string& name, const Content* old, const Content* now, const Content&) {
+        changes.push_back({name, {Copied(old), Copied(now)}});
+      });
   return changes;
 }
 
@@ -87,7 +90,7 @@ std::vector<ChangedRule> CompareRules(const DomainContent* before, const DomainC
   ForEachDifference(
       ByKey(before), ByKey(after),
       [](const PolicyRule& old, const PolicyRule& now) { return old.Means(now); },
-      [&](const RuleKey&, const PolicyRule* old, const PolicyRule* now) {
+      [&](const RuleKey&, const PolicyRule* old, const PolicyRule* now, const PolicyRule&) {
         changes.push_back({Copied(old), Copied(now)});
       });
   JoinRetargeted(changes);
@@ -99,11 +102,11 @@ std::vector<ChangedDomain> CompareDomains(const Policy& before, const Policy& af
   ForEachDifference(
       before.domains, after.domains,
       [](const DomainContent&, const DomainContent&) { return false; },
-      [&](const std::string& name, const DomainContent* old, const DomainContent* now) {
+      [&](const std::string& name, const DomainContent* old, const DomainContent* now,
+          const DomainContent& latest) {
         const Change kind = now == nullptr   ? Change::kRemoved
                             : old == nullptr ? Change::kAdded
                                              : Change::kChanged;
-        const DomainContent& latest = now == nullptr ? *old : *now;
         ChangedDomain change{name, kind, latest.place, CompareRules(old, now)};
         if (kind != Change::kChanged || !change.rules.empty()) changes.push_back(std::move(change));
       });

@@ -11,7 +11,6 @@
 
 namespace SecPolicyTool {
 
-using StandIn::WordList;
 using Words = std::vector<std::string>;
 
 namespace {

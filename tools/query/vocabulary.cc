@@ -13,6 +13,7 @@ namespace {
 template <typename Content>
 std::vector<std::string> NamesOf(const std::map<std::string, Content>& entries) {
   std::vector<std::string> names;
+  names.reserve(entries.size());
   for (const auto& [name, content] : entries) names.push_back(name);
   return names;
 }

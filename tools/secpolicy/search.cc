@@ -6,6 +6,7 @@
 #include <regex>
 
 #include "tools/policy/output.h"
+#include "tools/policy/terminal.h"
 #include "tools/query/host_paths.h"
 #include "tools/query/paths.h"
 #include "tools/query/rule_json.h"
@@ -34,8 +35,8 @@ struct SearchArguments {
 std::regex RegexOf(const std::string& text) try {
   return std::regex(text, std::regex::ECMAScript);
 } catch (const std::regex_error& problem) {
-  throw CLI::ValidationError("--word",
-                             "\"" + text + "\" is no regular expression: " + problem.what());
+  throw CLI::ValidationError(
+      "--word", "\"" + Printable(text) + "\" is no regular expression: " + problem.what());
 }
 
 SearchTerms TermsOf(const SearchArguments& arguments) {
@@ -80,11 +81,11 @@ ExitStatus PrintFound(const SearchArguments& arguments) {
 
 // For CLI11: what is wrong with the value of an option, or nothing.
 std::string TypeProblem(const std::string& name) {
-  return TypeNamed(name) ? "" : "no type of rules is called \"" + name + "\"";
+  return TypeNamed(name) ? "" : "no type of rules is called \"" + Printable(name) + "\"";
 }
 
 std::string PathProblem(const std::string& path) {
-  return path.starts_with('/') ? "" : "not an absolute path: \"" + path + "\"";
+  return path.starts_with('/') ? "" : "not an absolute path: \"" + Printable(path) + "\"";
 }
 
 }  // namespace

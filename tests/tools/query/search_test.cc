@@ -95,6 +95,7 @@ TEST_F(SearchTest, WrongUsageIsNamed) {
   for (const Row& row : {
            Row{{"--type", "-q"}, "--type: no type of rules is called \"-q\"\n"},
            Row{{"--word", "(", "--regex"}, "--word: \"(\" is no regular expression: "},
+           Row{{"--type", "\x1b[2J"}, "--type: no type of rules is called \"\\x1b[2J\"\n"},
            Row{{"--regex"}, "--regex requires --word\n"},
            Row{{"--path", "etc"}, "--path: not an absolute path: \"etc\"\n"},
            Row{{"--granted", "--revoked"}, "--"},
