@@ -88,7 +88,7 @@ std::string WordJudge::HelpForDomain(const std::string& name) {
   if (const auto found = domainHelps_.find(name); found != domainHelps_.end()) {
     return found->second;
   }
-  const std::string known = "make a file domains/" + name + "; it may be empty";
+  std::string known = "make a file domains/" + name + "; it may be empty";
   if (lookedForDomains_ > kMostCompared) return known;
   lookedForDomains_ += DomainNames().size();
   const auto nearest = StandIn::NearestWord(name, DomainNames());
