@@ -12,7 +12,7 @@ CheckTest::CheckTest() {
   Policy("fileLabels/base", "/etc/* conf\n/usr/bin/ls program\n");
 }
 
-void CheckTest::SetUp() { MakeHost({{"base.tar", base_}, {"vendor.tar", vendor_}}); }
+void CheckTest::MakeCheckHost() const { MakeHost({{"base.tar", base_}, {"vendor.tar", vendor_}}); }
 
 Result CheckTest::Check(const Arguments& more) const {
   Arguments arguments{"check", "--host", Host()};

@@ -13,7 +13,8 @@ namespace SecPolicyTool {
 class CheckTest : public CommandTest {
  protected:
   CheckTest();
-  void SetUp() override;
+  void SetUp() override { MakeCheckHost(); }
+  void MakeCheckHost() const;
 
   // The command with these arguments on the test's host and policy.
   Result Check(const Arguments& more = {}) const;

@@ -10,7 +10,6 @@
 namespace SecPolicyTool {
 namespace {
 
-using testing::Contains;
 using testing::ElementsAre;
 using testing::IsEmpty;
 

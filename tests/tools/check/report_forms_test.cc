@@ -10,7 +10,6 @@ namespace SecPolicyTool {
 namespace {
 
 using nlohmann::json;
-using testing::ElementsAre;
 using testing::HasSubstr;
 
 struct ExcerptCase {

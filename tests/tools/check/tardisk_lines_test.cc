@@ -6,7 +6,6 @@ namespace {
 
 using testing::Contains;
 using testing::ElementsAre;
-using testing::HasSubstr;
 using testing::IsEmpty;
 using testing::UnorderedElementsAre;
 
@@ -19,7 +18,7 @@ class TardiskLinesTest : public CheckTest {
   // The finished host, with such a file in its second tardisk.
   void MakeHostWith(const std::string& text) {
     vendor_.File("etc/olvane/secpolicy/tardisks/vendor", text);
-    CheckTest::SetUp();
+    MakeCheckHost();
   }
 
   void OwnTardisk(const std::string& text) const {
@@ -94,7 +93,7 @@ TEST_F(TardiskLinesTest, FileOfNoTardiskAndDirectory) {
 }
 
 TEST_F(TardiskLinesTest, OwnDirectoryIsCheckedAlthoughALoadDoesNotReadIt) {
-  CheckTest::SetUp();
+  MakeCheckHost();
   OwnTardisk("-E cnof appDm\n-x\n");
   EXPECT_THAT(
       Found(),
