@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <limits>
-#include <optional>
 #include <set>
 
 namespace SecPolicyTool {
@@ -112,6 +111,11 @@ FoundPaths FindPaths(const TransitionGraph& graph, std::size_t from, std::size_t
   }
   found.hasMore = !candidates.empty();
   return found;
+}
+
+std::optional<DomainPath> ShortestPath(const TransitionGraph& graph, std::size_t from,
+                                       std::size_t to) {
+  return Search(graph, to).Continue({from}, {});
 }
 
 const Link& LinkOf(const TransitionGraph& graph, const DomainPath& path, std::size_t step) {

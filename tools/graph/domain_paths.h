@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstddef>
+#include <optional>
 #include <vector>
 
 #include "tools/graph/transition_graph.h"
@@ -22,6 +23,10 @@ struct FoundPaths {
 // time is bounded however many paths there are.
 FoundPaths FindPaths(const TransitionGraph& graph, std::size_t from, std::size_t to,
                      std::size_t most);
+
+// The first of these paths alone; nothing when there is none. Goes over the graph once.
+std::optional<DomainPath> ShortestPath(const TransitionGraph& graph, std::size_t from,
+                                       std::size_t to);
 
 // The link by which a path goes from its step's domain to the next.
 const Link& LinkOf(const TransitionGraph& graph, const DomainPath& path, std::size_t step);

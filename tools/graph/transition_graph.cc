@@ -42,7 +42,7 @@ void TransitionGraph::AddTransitions(const Policy& policy,
     for (const PolicyRule& rule : domain.rules) {
       if (!IsEdge(rule) || (event && EventOf(rule) != *event)) continue;
       transitions_.push_back(
-          {from, Find(TargetOf(rule)).value(), LabelOf(rule), EventOf(rule), rule.place});
+          {from, Find(TargetOf(rule)).value(), LabelOf(rule), EventOf(rule), rule.place, &rule});
     }
   }
   const auto orderOf = [](const Transition& transition) {

@@ -19,6 +19,7 @@ struct Transition {
   std::string label;
   std::string event;
   std::optional<Place> place;
+  const PolicyRule* rule = nullptr;  // lives as long as the policy
 };
 
 // All transitions from one domain to another.

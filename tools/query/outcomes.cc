@@ -5,8 +5,8 @@
 namespace SecPolicyTool {
 
 std::vector<Outcome> Judge(const Policy& policy, const std::vector<Statement>& statements) {
+  Ways ways(policy);
   const Decisions decisions(policy);
-  const Steps steps(policy);
   std::vector<Outcome> outcomes;
   for (const Statement& each : statements) {
     Outcome outcome;
@@ -14,7 +14,7 @@ std::vector<Outcome> Judge(const Policy& policy, const std::vector<Statement>& s
       outcome.answer = decisions.Decide(each.domain, each.question);
       outcome.holds = outcome.answer.isAllowed == (each.kind == StatementKind::kMay);
     } else {
-      outcome.way = steps.WayTo(each.domain, each.target, each.event);
+      outcome.way = ways.Shortest(each.domain, each.target, each.event);
       outcome.holds = outcome.way.has_value() == (each.kind == StatementKind::kReaches);
     }
     outcomes.push_back(std::move(outcome));

@@ -1,62 +1,23 @@
 #include "tools/query/reach.h"
 
-#include <algorithm>
-#include <deque>
+#include "tools/graph/domain_paths.h"
 
 namespace SecPolicyTool {
 
-namespace {
-
-// The words of a transition: label, target domain, event.
-const std::string& TargetOf(const Step& step) { return step.rule->key.words[1]; }
-const std::string& EventOf(const Step& step) { return step.rule->key.words[2]; }
-
-// How each domain was come to first.
-using Arrivals = std::map<std::string, Step>;
-
-std::vector<Step> WayBack(const std::string& to, const Arrivals& arrivals) {
+std::optional<std::vector<Step>> Ways::Shortest(const std::string& from, const std::string& to,
+                                                const std::optional<std::string>& event) {
+  const TransitionGraph& graph = graphs_.try_emplace(event, policy_, event).first->second;
+  const auto begin = graph.Find(from);
+  const auto end = graph.Find(to);
+  if (!begin || !end) return std::nullopt;
+  const auto path = ShortestPath(graph, *begin, *end);
+  if (!path) return std::nullopt;
   std::vector<Step> way;
-  for (const std::string* at = &to;;) {
-    const Step& step = arrivals.at(*at);
-    if (step.rule == nullptr) break;
-    way.push_back(step);
-    at = step.from;
+  for (std::size_t step = 0; step + 1 < path->size(); ++step) {
+    const Transition& first = graph.TransitionsOf(LinkOf(graph, *path, step)).front();
+    way.push_back({&policy_.domains.find(graph.Domains()[first.from])->first, first.rule});
   }
-  std::reverse(way.begin(), way.end());
   return way;
-}
-
-}  // namespace
-
-Steps::Steps(const Policy& policy) {
-  for (const auto& [name, domain] : policy.domains) {
-    for (const PolicyRule& rule : domain.rules) {
-      if (rule.key.type != RuleType::kTransition || !rule.isGranted) continue;
-      from_[name].push_back({&name, &rule});
-    }
-  }
-}
-
-std::optional<std::vector<Step>> Steps::WayTo(const std::string& from, const std::string& to,
-                                              const std::optional<std::string>& event) const {
-  Arrivals arrivals{{from, Step{}}};
-  std::deque<std::string> waiting{from};
-  while (!waiting.empty() && !arrivals.contains(to)) {
-    const auto steps = from_.find(waiting.front());
-    waiting.pop_front();
-    if (steps == from_.end()) continue;
-    for (const Step& step : steps->second) {
-      if (event && EventOf(step) != *event) continue;
-      if (arrivals.emplace(TargetOf(step), step).second) waiting.push_back(TargetOf(step));
-    }
-  }
-  if (!arrivals.contains(to)) return std::nullopt;
-  return WayBack(to, arrivals);
-}
-
-bool Reaches(const Policy& policy, const std::string& from, const std::string& to,
-             const std::optional<std::string>& event) {
-  return Steps(policy).WayTo(from, to, event).has_value();
 }
 
 }  // namespace SecPolicyTool

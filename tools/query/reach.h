@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "tools/graph/transition_graph.h"
 #include "tools/policy/policy.h"
 
 namespace SecPolicyTool {
@@ -16,23 +17,20 @@ struct Step {
   const PolicyRule* rule = nullptr;
 };
 
-// The granted transitions of a policy, which must live as long as this.
-class Steps {
+// The ways that a policy's granted transitions make. The policy must live as long as this.
+class Ways {
  public:
-  explicit Steps(const Policy& policy);
+  explicit Ways(const Policy& policy) : policy_(policy) {}
 
   // A shortest way from one domain to another, by transitions of `event` or, without it, of any;
-  // no steps from a domain to itself. Nothing when there is no way.
-  [[nodiscard]] std::optional<std::vector<Step>> WayTo(
-      const std::string& from, const std::string& to,
-      const std::optional<std::string>& event) const;
+  // no steps from a domain to itself. Nothing when there is no way, or no such domain.
+  [[nodiscard]] std::optional<std::vector<Step>> Shortest(const std::string& from,
+                                                          const std::string& to,
+                                                          const std::optional<std::string>& event);
 
  private:
-  std::map<std::string, std::vector<Step>> from_;
+  const Policy& policy_;
+  std::map<std::optional<std::string>, TransitionGraph> graphs_;  // by event, as they are asked for
 };
-
-// Whether there is such a way.
-bool Reaches(const Policy& policy, const std::string& from, const std::string& to,
-             const std::optional<std::string>& event);
 
 }  // namespace SecPolicyTool

@@ -25,6 +25,7 @@ TEST(ReachTest, WaysAreFollowedByEvent) {
     bool isReached;
   };
   const Policy policy = Transitions();
+  Ways ways(policy);
   for (const Row& row : {
            Row{"rootDom", "aDom", std::nullopt, true},
            Row{"rootDom", "bDom", "exec", true},
@@ -37,8 +38,9 @@ TEST(ReachTest, WaysAreFollowedByEvent) {
            Row{"lonelyDom", "lonelyDom", std::nullopt, true},
            Row{"lonelyDom", "aDom", std::nullopt, false},
            Row{"rootDom", "lonelyDom", std::nullopt, false},
+           Row{"rootDom", "noDom", std::nullopt, false},
        }) {
-    EXPECT_EQ(Reaches(policy, row.from, row.to, row.event), row.isReached)
+    EXPECT_EQ(ways.Shortest(row.from, row.to, row.event).has_value(), row.isReached)
         << row.from << " " << row.to << " " << row.event.value_or("any");
   }
 }
@@ -46,7 +48,8 @@ TEST(ReachTest, WaysAreFollowedByEvent) {
 TEST(ReachTest, TheWayIsAShortestOne) {
   Policy policy = Transitions();
   policy.domains["rootDom"].rules.push_back(RuleOf("-d z bDom fork grant"));
-  const auto way = Steps(policy).WayTo("rootDom", "cDom", std::nullopt);
+  Ways ways(policy);
+  const auto way = ways.Shortest("rootDom", "cDom", std::nullopt);
   ASSERT_TRUE(way);
   std::vector<std::string> steps;
   for (const Step& step : *way) steps.push_back(*step.from + " " + LineOf(*step.rule));
