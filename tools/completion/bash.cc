@@ -55,10 +55,11 @@ std::string Case(const std::string& pattern, const std::string& text) {
 
 std::string ValueCases(const std::string& path, const CommandLine& verb) {
   std::string cases;
+  const std::string start = path + ":";
   for (const CommandOption& option : verb.options) {
     if (option.value.empty()) continue;
     for (const std::string& name : option.names) {
-      cases += Case(path + ":" + name, Offer(option));
+      cases += Case(start + name, Offer(option));
     }
   }
   return cases;

@@ -30,8 +30,9 @@ std::map<std::string, bool> EntriesOf(const std::string& dir) {
 }
 
 void ForEachBelow(const std::string& dir, const std::function<void(const std::string&)>& visit) {
+  const std::string above = dir.ends_with('/') ? dir : dir + "/";
   for (const auto& [name, isDirectory] : EntriesOf(dir)) {
-    const std::string path = dir.ends_with('/') ? dir + name : dir + "/" + name;
+    const std::string path = above + name;
     visit(path);
     if (isDirectory) ForEachBelow(path, visit);
   }

@@ -11,10 +11,10 @@ namespace SecPolicyTool {
 nlohmann::json ToJson(const Policy& policy);
 
 // The policy that ToJson made this of.
-Policy PolicyOfJson(const nlohmann::json& json);
+Policy PolicyOfJson(const nlohmann::json& content);
 
 // A place as {"file": ..., "line": ..., "column": ...}, without what is not known; null for none.
 nlohmann::json ToJson(const std::optional<Place>& place);
-std::optional<Place> PlaceOfJson(const nlohmann::json& json);
+std::optional<Place> PlaceOfJson(const nlohmann::json& entry);
 
 }  // namespace SecPolicyTool

@@ -111,7 +111,7 @@ class Verbs {
   }
   Verbs& NewPath() { return Required("NEW", arguments_->newPath, "The path that it gets"); }
   Verbs& Permission() {
-    verb_->add_option("PERMISSION", arguments_->permission, "Letters of \"rwx\", or \"-\" for none")
+    verb_->add_option("PERMISSION", arguments_->permission, R"(Letters of "rwx", or "-" for none)")
         ->required()
         ->check(PermissionProblem);
     return *this;
