@@ -115,9 +115,8 @@ TEST_F(ZshCompletionTest, OffersTheVerbsWithWhatTheyDo) {
 }
 
 TEST_F(ZshCompletionTest, OffersOptionsWithWhatTheyMean) {
-  EXPECT_THAT(Zsh("load --"),
-              AllOf(HasSubstr("--trace"), HasSubstr("Show every kernel operation"),
-                    HasSubstr("--fail"), Not(HasSubstr("--json"))));
+  EXPECT_THAT(Zsh("load --"), AllOf(HasSubstr("--trace"), HasSubstr("Show every kernel operation"),
+                                    HasSubstr("--fail"), Not(HasSubstr("--json"))));
 }
 
 TEST_F(ZshCompletionTest, OffersDirectoriesWhereOneIsAskedFor) {
