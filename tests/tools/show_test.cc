@@ -3,6 +3,7 @@
 #include <unistd.h>
 
 #include "tests/tools/command_fixture.h"
+#include "tests/tools/schema.h"
 
 namespace SecPolicyTool {
 namespace {
@@ -41,6 +42,22 @@ TEST_F(ShowTest, OneDomain) {
   ASSERT_EQ(Load().status, 0);
   EXPECT_THAT(Done({"show", "--host", Host(), "2"}).out,
               AllOf(HasSubstr("Domain Name: globalVMDom Domain ID :2 "), Not(HasSubstr("appDom"))));
+}
+
+TEST_F(ShowTest, JsonIsAsDescribed) {
+  Policy("domains/appDom", "-s open grant\n-r /motd rw\n");
+  ASSERT_EQ(Load().status, 0);
+  const std::string text = Done({"show", "--host", Host(), "--json"}).out;
+  EXPECT_EQ(JsonProblem(text, "show"), "") << text;
+  EXPECT_THAT(text, AllOf(HasSubstr("\"line\": \"-r /motd rw\""), HasSubstr("\"-s open grant\""),
+                          HasSubstr("\"/tardisks/base.tar\""), HasSubstr("\"globalVMDom\"")));
+}
+
+TEST_F(ShowTest, JsonOfOneDomain) {
+  ASSERT_EQ(Load().status, 0);
+  const std::string text = Done({"show", "--host", Host(), "--json", "2"}).out;
+  EXPECT_EQ(JsonProblem(text, "show"), "") << text;
+  EXPECT_THAT(text, AllOf(HasSubstr("\"globalVMDom\""), Not(HasSubstr("\"name\": \"appDom\""))));
 }
 
 TEST_F(ShowTest, UnknownDomainIsAnError) {

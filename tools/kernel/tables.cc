@@ -74,6 +74,12 @@ std::vector<DomainRow> ReadDomains(ZekAccessInterfaceImpl& iface) {
   return rows;
 }
 
+nlohmann::json ToJson(const DomainRow& row) {
+  return {
+      {"id", row.id},       {"name", row.name},         {"enforcementLevel", row.enforcementLevel},
+      {"state", row.state}, {"refCount", row.refCount}, {"worldRefCount", row.worldRefCount}};
+}
+
 unsigned int DomainOf(const std::string& name, ZekAccessInterfaceImpl& iface) {
   unsigned int id = 0;
   if (iface.FindDomain(name, &id)) return id;

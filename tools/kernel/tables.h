@@ -1,6 +1,7 @@
 // Tables of the kernel that may grow while they are read.
 #pragma once
 
+#include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
@@ -26,6 +27,9 @@ struct DomainRow {
   unsigned int refCount = 0;
   unsigned int worldRefCount = 0;
 };
+
+// An object with a member of each name.
+nlohmann::json ToJson(const DomainRow& row);
 
 // All domains, by ascending id. Throws what the kernel-access library throws.
 std::vector<DomainRow> ReadDomains(SecPolicy::ZekAccessInterfaceImpl& iface);

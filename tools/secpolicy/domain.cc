@@ -29,12 +29,7 @@ void List(const DomainArguments& arguments) {
   json rows = json::array();
   for (const DomainRow& row : ReadDomains(iface)) {
     if (arguments.isJson) {
-      rows.push_back({{"id", row.id},
-                      {"name", row.name},
-                      {"enforcementLevel", row.enforcementLevel},
-                      {"state", row.state},
-                      {"refCount", row.refCount},
-                      {"worldRefCount", row.worldRefCount}});
+      rows.push_back(ToJson(row));
     } else {
       std::cout << row.id << " " << Printable(row.name) << "\n";
     }
