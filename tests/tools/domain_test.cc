@@ -49,8 +49,8 @@ TEST_F(DomainTest, RefusalsAreTheKernels) {
 
 TEST_F(DomainTest, UnknownNameIsSaidWithTheNearest) {
   Out({"create", "guestDom"});
-  ExpectRefusal({"destroy", "gusetDom"}, R"(no domain is called "gusetDom" (nearest: guestDom))");
-  ExpectRefusal({"destroy", "1x"}, R"(no domain is called "1x")");
+  ExpectRefusal({"destroy", "gusetDom"}, R"(unknown domain "gusetDom" (nearest: guestDom))");
+  ExpectRefusal({"destroy", "1x"}, R"(unknown domain "1x")");
 }
 
 // The process that made it has ended, and nothing runs in it.

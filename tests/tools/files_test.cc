@@ -65,7 +65,7 @@ TEST_F(FilesTest, RefusalsAreTheKernels) {
   ExpectRefusal({"add", "rootDom", "/a", "r", "--world", "999999999"},
                 "Failed to add file policies to domain :0: world ID :999999999:No such process");
   ExpectRefusal({"list", "7"}, "Failed to get number of file policies for domain :: 7:" + enoent);
-  ExpectRefusal({"list", "rooDom"}, R"(no domain is called "rooDom" (nearest: rootDom))");
+  ExpectRefusal({"list", "rooDom"}, R"(unknown domain "rooDom" (nearest: rootDom))");
 }
 
 TEST_F(FilesTest, LongestPathIsTaken) {

@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <stdexcept>
 
-#include "host/module/nearest_word.h"
 #include "tools/policy/policy_json.h"
+#include "tools/policy/unknown_word.h"
 
 namespace SecPolicyTool {
 
@@ -72,9 +72,7 @@ json StepJson(const TransitionGraph& graph, const Link& link) {
 
 std::size_t RequireDomain(const TransitionGraph& graph, const std::string& name) {
   if (const auto domain = graph.Find(name)) return *domain;
-  const auto nearest = StandIn::NearestWord(name, graph.Domains());
-  throw std::runtime_error("unknown domain \"" + Printable(name) + "\"" +
-                           (nearest ? " (nearest: " + Printable(*nearest) + ")" : ""));
+  throw std::runtime_error(UnknownWordText("domain", name, graph.Domains()));
 }
 
 std::string PathsText(const TransitionGraph& graph, const PathQuestion& question,

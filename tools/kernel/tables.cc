@@ -4,7 +4,7 @@
 #include <optional>
 #include <stdexcept>
 
-#include "host/module/nearest_word.h"
+#include "tools/policy/unknown_word.h"
 
 namespace SecPolicyTool {
 
@@ -28,8 +28,7 @@ std::optional<unsigned int> Number(const std::string& text) {
 std::string UnknownDomain(const std::string& name, ZekAccessInterfaceImpl& iface) {
   std::vector<std::string> names;
   for (const DomainRow& row : ReadDomains(iface)) names.push_back(row.name);
-  const auto nearest = StandIn::NearestWord(name, names);
-  return "no domain is called \"" + name + "\"" + (nearest ? " (nearest: " + *nearest + ")" : "");
+  return UnknownWordText("domain", name, names);
 }
 
 }  // namespace

@@ -35,7 +35,7 @@ nlohmann::json ToJson(const DomainRow& row);
 std::vector<DomainRow> ReadDomains(SecPolicy::ZekAccessInterfaceImpl& iface);
 
 // The id of the domain that `name` names: one of that name, else, when it is a number, that one.
-// Throws std::runtime_error `no domain is called "NAME"`, with the nearest name if one is near.
+// Throws std::runtime_error `unknown domain "NAME"`, as UnknownWordText.
 unsigned int DomainOf(const std::string& name, SecPolicy::ZekAccessInterfaceImpl& iface);
 
 }  // namespace SecPolicyTool

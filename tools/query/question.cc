@@ -7,6 +7,7 @@
 #include "host/module/nearest_word.h"
 #include "host/module/word_lists.h"
 #include "tools/policy/terminal.h"
+#include "tools/policy/unknown_word.h"
 #include "tools/query/paths.h"
 
 namespace SecPolicyTool {
@@ -95,7 +96,7 @@ std::optional<std::string> ProblemOf(const std::string& word, std::size_t positi
   if (!info.list) {
     const bool isDomain = type == RuleType::kTransition;
     if (!isDomain || Holds(vocabulary.domains, word)) return std::nullopt;
-    return UnknownDomainText(word, vocabulary.domains);
+    return UnknownWordText("domain", word, vocabulary.domains);
   }
   const Words& list = vocabulary.lists.at(*info.list);
   if (Holds(list, word)) return std::nullopt;

@@ -50,7 +50,7 @@ using PathResolver = std::function<std::string(const std::string&)>;
 
 // The question in `words`. `resolve` is handed paths. Throws BadQuestion: those of CheckForm, and
 // (kWord) "unknown operation "WORD" (nearest: NEAREST)", "unknown LIST "WORD" (nearest: NEAREST)",
-// "no domain is called NAME (nearest: OTHER)".
+// `unknown domain "NAME" (nearest: OTHER)`.
 Question ParseQuestion(const std::vector<std::string>& words, const Vocabulary& vocabulary,
                        const PathResolver& resolve);
 

@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <array>
 
-#include "host/module/nearest_word.h"
 #include "host/module/word_lists.h"
 #include "tools/policy/terminal.h"
+#include "tools/policy/unknown_word.h"
 
 namespace SecPolicyTool {
 
@@ -41,9 +41,7 @@ const StatementForm& FormOf(const Words& words) {
   if (form == kForms.end()) {
     Words known;
     for (const StatementForm& each : kForms) known.emplace_back(each.word);
-    const auto nearest = StandIn::NearestWord(words[0], known);
-    throw BadStatement{0, "unknown statement \"" + Printable(words[0]) + "\"" +
-                              (nearest ? " (nearest: " + *nearest + ")" : "")};
+    throw BadStatement{0, UnknownWordText("statement", words[0], known)};
   }
   if (words.size() < form->fewest || (form->most != 0 && words.size() > form->most)) {
     throw BadStatement{0, words[0] + " takes other words: " + form->form};
@@ -54,7 +52,7 @@ const StatementForm& FormOf(const Words& words) {
 void RequireDomain(const Words& words, std::size_t at, const Vocabulary& vocabulary) {
   const Words& domains = vocabulary.domains;
   if (std::find(domains.begin(), domains.end(), words[at]) == domains.end()) {
-    throw BadStatement{at, UnknownDomainText(words[at], domains)};
+    throw BadStatement{at, UnknownWordText("domain", words[at], domains)};
   }
 }
 

@@ -44,7 +44,7 @@ struct StatementFile {
 // The statements in `text`. A problem's text is that of BadQuestion, or
 //   "unknown statement "WORD" (nearest: NEAREST)"
 //   "WORD takes other words: FORM"
-//   "no domain is called NAME (nearest: OTHER)"
+//   "unknown domain "NAME" (nearest: OTHER)"
 //   "unknown transition event "WORD" (nearest: NEAREST)"
 //   "the line is longer than 1023 bytes; what is behind it is not read"
 StatementFile ParseStatements(const PolicyText& text, const Vocabulary& vocabulary,

@@ -3,8 +3,8 @@
 #include <stdexcept>
 
 #include "host/module/description_json.h"
-#include "host/module/nearest_word.h"
 #include "tools/policy/terminal.h"
+#include "tools/policy/unknown_word.h"
 
 namespace SecPolicyTool {
 
@@ -30,16 +30,10 @@ Vocabulary VocabularyOf(const StandIn::HostDirectory& host, const Policy& policy
   return words;
 }
 
-std::string UnknownDomainText(const std::string& name, const std::vector<std::string>& domains) {
-  const std::string text = "no domain is called " + Printable(name);
-  const auto nearest = StandIn::NearestWord(name, domains);
-  return nearest ? text + " (nearest: " + Printable(*nearest) + ")" : text;
-}
-
 const DomainContent& DomainOf(const Policy& policy, const std::string& name) {
   const auto domain = policy.domains.find(name);
   if (domain != policy.domains.end()) return domain->second;
-  throw std::runtime_error(UnknownDomainText(name, NamesOf(policy.domains)));
+  throw std::runtime_error(UnknownWordText("domain", name, NamesOf(policy.domains)));
 }
 
 }  // namespace SecPolicyTool

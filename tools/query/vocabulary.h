@@ -20,10 +20,7 @@ struct Vocabulary {
 // host's description is damaged.
 Vocabulary VocabularyOf(const StandIn::HostDirectory& host, const Policy& policy);
 
-// "no domain is called NAME (nearest: OTHER)", or without the bracket when none is near.
-std::string UnknownDomainText(const std::string& name, const std::vector<std::string>& domains);
-
-// The domain of that name. Throws std::runtime_error with that text.
+// The domain of that name. Throws std::runtime_error `unknown domain "NAME"`, as UnknownWordText.
 const DomainContent& DomainOf(const Policy& policy, const std::string& name);
 
 }  // namespace SecPolicyTool

@@ -172,8 +172,8 @@ TEST(QuestionTest, MistakesAreNamedWithTheirWord) {
                "unknown transition event \"exe\" (nearest: exec)"},
            Row{"transition exec prgram netDom", 2,
                "unknown object label \"prgram\" (nearest: program)"},
-           Row{"transition exec program netDm", 3, "no domain is called netDm (nearest: netDom)"},
-           Row{"transition exec program frobnicate", 3, "no domain is called frobnicate"},
+           Row{"transition exec program netDm", 3, "unknown domain \"netDm\" (nearest: netDom)"},
+           Row{"transition exec program frobnicate", 3, "unknown domain \"frobnicate\""},
        }) {
     try {
       Ask(row.question);

@@ -94,7 +94,7 @@ TEST_F(MayTest, UnknownWordsAreErrors) {
     const char* error;
   };
   for (const Row& row : {
-           Row{{"apDom", "syscall", "open"}, "no domain is called apDom (nearest: appDom)"},
+           Row{{"apDom", "syscall", "open"}, "unknown domain \"apDom\" (nearest: appDom)"},
            Row{{"appDom", "syscall", "opn"}, "unknown system call \"opn\" (nearest: open)"},
            Row{{"appDom", "raed", "conf"}, "unknown operation \"raed\" (nearest: read)"},
            Row{{"appDom", "read", "cnf"}, "unknown object label \"cnf\" (nearest: conf)"},

@@ -84,7 +84,7 @@ TEST_F(SearchTest, StatusSaysWhetherAnythingWasFound) {
 TEST_F(SearchTest, UnknownDomainIsAnError) {
   const Result result = Verb("search", {PolicyDir(), "--domain", "apDom"});
   EXPECT_EQ(result.status, 1);
-  EXPECT_EQ(result.err, "Error: no domain is called apDom (nearest: appDom)\n");
+  EXPECT_EQ(result.err, "Error: unknown domain \"apDom\" (nearest: appDom)\n");
 }
 
 TEST_F(SearchTest, WrongUsageIsNamed) {

@@ -72,12 +72,12 @@ TEST(StatementsTest, EveryMistakeIsNamedWithItsPlace) {
       {"never appDom", 1, "never takes other words: never DOMAIN OPERATION OBJECT..."},
       {"reaches appDom", 1, "reaches takes other words: reaches FROM TO [EVENT]"},
       {"unreachable a b exec c", 1, "unreachable takes other words: unreachable FROM TO [EVENT]"},
-      {"may apDom syscall open", 5, "no domain is called apDom (nearest: appDom)"},
+      {"may apDom syscall open", 5, "unknown domain \"apDom\" (nearest: appDom)"},
       {"may appDom  syscal open", 13, "unknown operation \"syscal\" (nearest: syscall)"},
       {"may appDom syscall opn", 20, "unknown system call \"opn\" (nearest: open)"},
       {"may appDom syscall open read", 12, "syscall takes other words: syscall NAME"},
-      {"reaches rotDom appDom", 9, "no domain is called rotDom (nearest: rootDom)"},
-      {"reaches rootDom x", 17, "no domain is called x"},
+      {"reaches rotDom appDom", 9, "unknown domain \"rotDom\" (nearest: rootDom)"},
+      {"reaches rootDom x", 17, "unknown domain \"x\""},
       {"reaches rootDom appDom exe", 24, "unknown transition event \"exe\" (nearest: exec)"},
   };
   std::string text;
