@@ -28,20 +28,8 @@ std::string AtLine(const std::string& path, unsigned int line, const std::string
 
 namespace {
 
-// A policy directory: where a load finds it, and what its user calls it.
-struct CheckedPlace {
-  std::string path;
-  std::string shown;
-
-  [[nodiscard]] DirectoryToRead Below(const char* name) const {
-    return {path + "/" + name, shown + "/" + name, false};
-  }
-};
-
-CheckedPlace PlaceOf(const PolicyPath& location, const std::string& dir) {
-  std::string shown = dir.empty() ? location.path : dir;
-  while (shown.size() > 1 && shown.ends_with('/')) shown.pop_back();
-  return {location.path, shown};
+DirectoryToRead Below(const PolicyFiles& policy, const char* name) {
+  return {policy.path + "/" + name, policy.shown + "/" + name, false};
 }
 
 struct CheckedPolicy {
@@ -61,15 +49,15 @@ bool Exists(const std::string& path) {
   return std::filesystem::exists(path, ignored);
 }
 
-CheckedPolicy ReadAll(const CheckedPlace& place, Findings& findings) {
+CheckedPolicy ReadAll(const PolicyFiles& place, Findings& findings) {
   CheckedPolicy policy;
-  policy.objects = ReadDirectory(place.Below("objects"), findings);
-  policy.domains = ReadDirectory(place.Below("domains"), findings);
-  policy.fileLabels = ReadDirectory(place.Below("fileLabels"), findings);
+  policy.objects = ReadDirectory(Below(place, "objects"), findings);
+  policy.domains = ReadDirectory(Below(place, "domains"), findings);
+  policy.fileLabels = ReadDirectory(Below(place, "fileLabels"), findings);
   if (Exists(kTardiskPolicyDir)) {
     policy.tardisks = ReadDirectory({kTardiskPolicyDir, kTardiskPolicyDir, true}, findings);
   }
-  const DirectoryToRead own = place.Below("tardisks");
+  const DirectoryToRead own = Below(place, "tardisks");
   if (own.path != kTardiskPolicyDir && Exists(own.path)) {
     findings.AddWarning(Kind::kSkippedEntry, SpotOf(own.shown),
                         std::string("a load reads tardisk policy from the host's own ") +
@@ -82,7 +70,7 @@ CheckedPolicy ReadAll(const CheckedPlace& place, Findings& findings) {
 }
 
 // In the host, after the load.
-json CheckAfter(const std::vector<std::string>& errors, const CheckedPlace& place,
+json CheckAfter(const std::vector<std::string>& errors, const PolicyFiles& place,
                 const StandIn::ImageIndex& image, StandIn::SecurityModule& module) {
   Findings findings;
   const CheckedPolicy policy = ReadAll(place, findings);
@@ -109,7 +97,7 @@ json CheckAfter(const std::vector<std::string>& errors, const CheckedPlace& plac
 
 CheckReport CheckWholePolicy(HostDirectory host, const std::string& dir) {
   const PolicyPath location = LocatePolicy(dir);
-  const CheckedPlace place = PlaceOf(location, dir);
+  const PolicyFiles place = location.Files();
   const StandIn::ImageIndex image = ImageOf(host);
   ErrorCapture errors;
   const auto load = [&](Session&) {

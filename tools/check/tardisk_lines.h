@@ -2,11 +2,9 @@
 #pragma once
 
 #include "tools/check/check_context.h"
+#include "tools/policy/policy_files.h"
 
 namespace SecPolicyTool {
-
-// Where a load takes tardisk policy from, in the host, whatever directory it is given.
-inline constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
 
 // Whether a load reads these files.
 enum class TardiskFiles {

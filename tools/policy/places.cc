@@ -14,9 +14,6 @@ namespace SecPolicyTool {
 
 namespace {
 
-// Tardisk policy is read from here, whatever directory is loaded.
-constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
-
 using Lines = std::vector<PolicyLine>;
 
 // The line's words, from the one at `first` on, as far as there are so many.

@@ -6,6 +6,11 @@
 
 namespace SecPolicyTool {
 
+// A host's own policy directory, in the host.
+inline constexpr char kSystemPolicyDir[] = "/etc/olvane/secpolicy";
+// Where every load reads the policy of the tardisks, whatever directory it is given.
+inline constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
+
 // A policy directory: its path in the host, and what its user calls it.
 struct PolicyFiles {
   std::string path;

@@ -22,10 +22,11 @@ fs::path AbsolutePath(const std::string& dir) {
 }  // namespace
 
 PolicyPath LocatePolicy(const std::string& dir) {
-  if (dir.empty()) return {"/etc/olvane/secpolicy", {}};
-  const std::string path = AbsolutePath(dir).string();
-  if (fs::is_directory(path)) return {path, {path}};
-  return {path, {}};
+  if (dir.empty()) return {kSystemPolicyDir, {}, kSystemPolicyDir};
+  PolicyPath location{AbsolutePath(dir).string(), {}, dir};
+  while (location.shown.size() > 1 && location.shown.ends_with('/')) location.shown.pop_back();
+  if (fs::is_directory(location.path)) location.visible.push_back(location.path);
+  return location;
 }
 
 }  // namespace SecPolicyTool

@@ -4,16 +4,21 @@
 #include <string>
 #include <vector>
 
+#include "tools/policy/policy_files.h"
+
 namespace SecPolicyTool {
 
 struct PolicyPath {
   std::string path;                  // absolute
   std::vector<std::string> visible;  // what has to be made visible in the host for it
+  std::string shown;                 // what its user calls it, without slashes at its end
+
+  [[nodiscard]] PolicyFiles Files() const { return {path, shown}; }
 };
 
 // Where `dir`, as given on the command line, is: a directory outside the host, which is to be seen
 // inside under the same absolute path, or else one that only the host may have. Empty for the
-// host's own "/etc/olvane/secpolicy".
+// host's own, kSystemPolicyDir.
 PolicyPath LocatePolicy(const std::string& dir);
 
 }  // namespace SecPolicyTool

@@ -20,12 +20,11 @@ SourcePolicy ReadSource(HostDirectory host, const std::string& source) {
   if (source == kKernelSource) return {HeldPolicy(host), {}, false};
   const PolicyPath dir = LocatePolicy(source);
   const StandIn::ImageIndex image = ImageOf(host);
-  const PolicyFiles files{dir.path, source.empty() ? dir.path : source};
   const HostWork outcome = WorkInHost(
       std::move(host), TrialOptions(dir), [&](Session&) { LoadOnTrial(dir); },
       [&](Session& session) {
         Policy policy = HeldPolicy(session.Module(), image);
-        AddPlaces(files, image, policy);
+        AddPlaces(dir.Files(), image, policy);
         return ToJson(policy);
       });
   return {PolicyOfJson(outcome.result), outcome.errors, outcome.wasTerminated};

@@ -4,7 +4,6 @@
 #include <array>
 
 #include "host/module/word_lists.h"
-#include "tools/policy/terminal.h"
 #include "tools/policy/unknown_word.h"
 
 namespace SecPolicyTool {

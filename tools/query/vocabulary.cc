@@ -3,7 +3,6 @@
 #include <stdexcept>
 
 #include "host/module/description_json.h"
-#include "tools/policy/terminal.h"
 #include "tools/policy/unknown_word.h"
 
 namespace SecPolicyTool {

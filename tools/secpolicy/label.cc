@@ -159,7 +159,7 @@ ExitStatus RunVerify(const LabelArguments& arguments) {
   StandIn::SessionOptions options;
   options.visible = policy.visible;
   const auto session = EnterHost(arguments.host, options);
-  const PolicyFiles files{policy.path, arguments.policy.empty() ? policy.path : arguments.policy};
+  const PolicyFiles files = policy.Files();
   std::map<std::string, std::string> listed;
   SecPolicy::GetFileList(files.path + "/fileLabels", listed);
   Verify(arguments, files, results);

@@ -123,6 +123,12 @@ TEST_F(PolicySourceTest, PlacesNameFilesAsTheUserDoes) {
   EXPECT_EQ(PlaceText(source.policy.domains.at("appDom").place), "policy/domains/appDom");
 }
 
+TEST_F(PolicySourceTest, SlashesAtTheEndOfADirectoryAreNotShown) {
+  MakeHost();
+  const SourcePolicy source = Read(PolicyDir() + "//");
+  EXPECT_EQ(PlaceText(source.policy.domains.at("appDom").place), PolicyDir() + "/domains/appDom");
+}
+
 TEST_F(PolicySourceTest, ErrorsAreThoseOfALoad) {
   MakeHost();
   Policy("domains/appDom", "-s open grant\n-s opne grant\n-s close grant\n");
