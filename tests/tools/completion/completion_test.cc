@@ -95,17 +95,22 @@ class ZshCompletionTest : public CompletionTest {
     static constexpr char kProgram[] = R"(
 zmodload zsh/zpty
 zpty shell zsh -f -i
-zpty -w shell "cd $1; PS1=; autoload -U compinit; compinit -u -D; . ./zsh"
+zpty -w shell "cd $1; autoload -U compinit; compinit -u -D; . ./zsh"
 zpty -w shell "bindkey '^I' complete-word; zstyle ':completion:*' list-separator '--'"
-zpty -w shell "LISTMAX=9999; setopt no_list_beep; COLUMNS=200; LINES=200; print -n READY; print "
-zpty -r -m shell line '*READY*READY*'
+zpty -w shell "LISTMAX=9999; setopt no_list_beep; COLUMNS=200; LINES=200; PS1=REA'DY>'"
+# Not before its prompt does it read keys as such.
+zpty -r -m shell line '*READY>*'
 zpty -w -n shell "secpolicy $2"$'\C-d'
 zpty -w -n shell $'\C-u'"print -n DO; print NE"$'\n'
 zpty -r -m shell all '*DONE*'
 print -r -- "$all"
 zpty -d shell
 )";
-    return RunProgram("/bin/zsh", {"-f", "-c", kProgram, "zsh", Path(""), typed}, [] {}).out;
+    const Result result =
+        RunProgram("/usr/bin/timeout",
+                   {"60", "/bin/zsh", "-f", "-c", kProgram, "zsh", Path(""), typed}, [] {});
+    EXPECT_EQ(result.status, 0) << "zsh did not answer";
+    return result.out;
   }
 };
 
