@@ -50,8 +50,6 @@ class Session {
 
   // The module behind all hooks, as the platform's libraries use it.
   [[nodiscard]] SecurityModule& Module() { return observed_; }
-  // What the module holds now, in the form of kernel.json.
-  [[nodiscard]] std::string SavedState() const { return module_.Save(); }
 
  private:
   HostDirectory host_;
