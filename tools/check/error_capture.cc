@@ -1,7 +1,8 @@
 #include "tools/check/error_capture.h"
 
 #include <iostream>
-#include <string_view>
+
+#include "tools/policy/error_messages.h"
 
 namespace SecPolicyTool {
 
@@ -14,17 +15,9 @@ void ErrorCapture::End() {
 }
 
 std::vector<std::string> ErrorCapture::Errors() const {
-  constexpr std::string_view kMark = "Error: ";
   std::vector<std::string> errors;
   std::istringstream lines(text_.str());
-  for (std::string line; std::getline(lines, line);) {
-    if (line.starts_with(kMark)) {
-      errors.push_back(line.substr(kMark.size()));
-    } else if (!errors.empty()) {
-      // A name in the message holds a newline.
-      errors.back() += "\n" + line;
-    }
-  }
+  for (std::string line; std::getline(lines, line);) AddMessageLine(errors, line);
   return errors;
 }
 

@@ -3,7 +3,8 @@
 #include <algorithm>
 #include <string_view>
 
-#include "tools/check/utf8_text.h"
+#include "tools/policy/terminal.h"
+#include "tools/policy/utf8_text.h"
 
 namespace SecPolicyTool {
 
@@ -31,10 +32,9 @@ LineExcerpt ExcerptOf(const std::string& line, unsigned int column, unsigned int
   const std::size_t end =
       isLong ? CharacterBegin(whole, std::min(begin + kShown, whole.size())) : whole.size();
   const std::size_t stop = std::clamp<std::size_t>(at + std::max(1U, length), at, end);
-  const std::string before =
-      (begin > 0 ? kCut : "") + TerminalText(whole.substr(begin, at - begin));
-  const std::string meant = TerminalText(whole.substr(at, stop - at));
-  const std::string behind = TerminalText(whole.substr(stop, end - stop));
+  const std::string before = (begin > 0 ? kCut : "") + Printable(whole.substr(begin, at - begin));
+  const std::string meant = Printable(whole.substr(at, stop - at));
+  const std::string behind = Printable(whole.substr(stop, end - stop));
   const std::size_t width = std::max<std::size_t>(1, CharacterCount(meant));
   return {before + meant + behind + (end < whole.size() ? kCut : ""),
           std::string(CharacterCount(before), ' ') + "^" + std::string(width - 1, '~')};

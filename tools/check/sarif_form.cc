@@ -6,7 +6,7 @@
 
 #include "tools/check/finding_kinds.h"
 #include "tools/check/report_forms.h"
-#include "tools/check/utf8_text.h"
+#include "tools/policy/utf8_text.h"
 
 namespace SecPolicyTool {
 

@@ -2,7 +2,6 @@
 
 #include "tools/check/line_excerpt.h"
 #include "tools/check/report_forms.h"
-#include "tools/check/utf8_text.h"
 
 namespace SecPolicyTool {
 
@@ -13,7 +12,7 @@ std::string Counted(std::size_t count, const char* what) {
 }
 
 std::string PlaceInFront(const Place& place) {
-  return place.file.empty() ? std::string() : TerminalText(PlaceText(place)) + ": ";
+  return place.file.empty() ? std::string() : Printable(PlaceText(place)) + ": ";
 }
 
 std::string MarkedLine(const Finding& finding, Colour colour, const Painter& painter) {
@@ -38,10 +37,10 @@ std::string TextForm(const Finding& finding, const Painter& painter) {
   const Colour colour = isError ? Colour::kRed : Colour::kYellow;
   std::string text = painter.Paint(Colour::kBold, PlaceInFront(finding.place)) +
                      painter.Paint(colour, isError ? "error:" : "warning:") + " " +
-                     TerminalText(finding.message) + " [" + finding.id + "]\n" +
+                     Printable(finding.message) + " [" + finding.id + "]\n" +
                      MarkedLine(finding, colour, painter);
   if (!finding.help.empty()) {
-    text += painter.Paint(Colour::kCyan, "help:") + " " + TerminalText(finding.help) + "\n";
+    text += painter.Paint(Colour::kCyan, "help:") + " " + Printable(finding.help) + "\n";
   }
   return text;
 }

@@ -5,7 +5,7 @@ namespace SecPolicyTool {
 
 namespace {
 
-// `text` within single quotes, as part of a specification of _arguments, in which some characters
+// `text` within single quotes, as part of what _arguments takes, in which some characters
 // mean something.
 std::string Escaped(const std::string& text) {
   std::string escaped;

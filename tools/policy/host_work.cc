@@ -11,6 +11,7 @@
 
 #include "host/image/file_io.h"
 #include "tools/policy/child_process.h"
+#include "tools/policy/error_messages.h"
 #include "tools/policy/exit_status.h"
 #include "tools/policy/progress.h"
 
@@ -78,18 +79,6 @@ int Finish(const Current& now) {
   _exit(kTerminated);
 }
 
-// Adds a line of standard error; one without the mark of a message goes on with the last.
-void AddLine(std::vector<std::string>& errors, const std::string& line) {
-  constexpr std::string_view kMark = "Error: ";
-  if (line.starts_with(kMark)) {
-    errors.push_back(line.substr(kMark.size()));
-  } else if (errors.empty()) {
-    errors.push_back(line);
-  } else {
-    errors.back() += "\n" + line;
-  }
-}
-
 }  // namespace
 
 HostWork WorkInHost(StandIn::HostDirectory host, StandIn::SessionOptions options,
@@ -107,7 +96,8 @@ HostWork WorkInHost(StandIn::HostDirectory host, StandIn::SessionOptions options
   };
   Progress progress("Working in the host");
   const int status = RunInChild(
-      inHost, [&](std::string& line) { AddLine(outcome.errors, line); }, [&] { progress.Tick(); });
+      inHost, [&](std::string& line) { AddMessageLine(outcome.errors, line); },
+      [&] { progress.Tick(); });
   if (WIFSIGNALED(status)) {
     throw std::runtime_error(std::string("the work in the host was killed (") +
                              strsignal(WTERMSIG(status)) + ")");
@@ -117,11 +107,11 @@ HostWork WorkInHost(StandIn::HostDirectory host, StandIn::SessionOptions options
     throw std::runtime_error(content["failure"].get_ref<const std::string&>());
   }
   outcome.wasTerminated = WEXITSTATUS(status) == kTerminated;
-  if (content.contains("result")) {
-    outcome.result = std::move(content["result"]);
-  } else if (!outcome.errors.empty()) {
-    throw std::runtime_error(outcome.errors.back());
+  if (!content.contains("result")) {
+    throw std::runtime_error(outcome.errors.empty() ? "the work in the host came to no end"
+                                                    : outcome.errors.back());
   }
+  outcome.result = std::move(content["result"]);
   return outcome;
 }
 

@@ -12,7 +12,7 @@ namespace SecPolicyTool {
 
 // What a piece of work gave.
 struct HostWork {
-  nlohmann::json result;            // null when it did not come to an end
+  nlohmann::json result;
   std::vector<std::string> errors;  // what it wrote to standard error, an entry for each message
   bool wasTerminated = false;       // by the library, since a domain that the host needs is missing
 };

@@ -2,9 +2,12 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <cstdlib>
 #include <string_view>
+
+#include "tools/policy/utf8_text.h"
 
 namespace SecPolicyTool {
 
@@ -28,16 +31,37 @@ std::string Painter::Paint(Colour colour, const std::string& text) const {
          "\x1b[0m";
 }
 
-std::string Printable(const std::string& text) {
+namespace {
+
+std::string Escaped(std::string_view bytes) {
   constexpr char kHex[] = "0123456789abcdef";
-  std::string shown;
-  for (const char c : text) {
+  std::string text;
+  for (const char c : bytes) {
     const auto byte = static_cast<unsigned char>(c);
-    if (byte >= 0x20 && byte != 0x7F) {
-      shown += c;
-    } else {
-      shown += std::string("\\x") + kHex[byte >> 4] + kHex[byte & 0xF];
-    }
+    text += std::string("\\x") + kHex[byte >> 4] + kHex[byte & 0xF];
+  }
+  return text;
+}
+
+bool IsPlain(char c) { return c >= ' ' && c <= '~'; }
+
+// C1 control characters, which are two bytes in UTF-8, mean something to some terminals.
+bool IsControl(std::string_view character) {
+  if (character.size() == 1) return !IsPlain(character[0]);
+  return character.size() == 2 && character[0] == '\xC2' &&
+         static_cast<unsigned char>(character[1]) < 0xA0;
+}
+
+}  // namespace
+
+std::string Printable(std::string_view text) {
+  if (std::all_of(text.begin(), text.end(), IsPlain)) return std::string(text);
+  std::string shown;
+  while (!text.empty()) {
+    const std::size_t bytes = CharacterBytes(text);
+    const std::string_view part = text.substr(0, std::max<std::size_t>(1, bytes));
+    shown += bytes == 0 || IsControl(part) ? Escaped(part) : std::string(part);
+    text.remove_prefix(part.size());
   }
   return shown;
 }

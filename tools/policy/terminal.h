@@ -3,6 +3,7 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 namespace SecPolicyTool {
 
@@ -23,8 +24,8 @@ class Painter {
   bool isColoured_;
 };
 
-// `text` with control characters, which could change what a terminal shows, written as \xNN; tabs
-// and newlines too.
-std::string Printable(const std::string& text);
+// `text` with control characters, those beyond ASCII too, and bytes that are no UTF-8 written as
+// \xNN, so that it cannot change what a terminal shows, and is as wide as its characters are many.
+std::string Printable(std::string_view text);
 
 }  // namespace SecPolicyTool

@@ -7,10 +7,7 @@ namespace SecPolicyTool {
 void AddAskingOptions(CLI::App& verb, AskingArguments& arguments) {
   AddHostOption(verb, arguments.host);
   AddJsonOption(verb, arguments.isJson);
-  verb.add_option("--policy", arguments.policy,
-                  "The policy that is asked: a directory, or \"kernel\", as without it, for what "
-                  "the host's kernel holds")
-      ->type_name("DIR|kernel");
+  AddPolicyOption(verb, arguments.policy);
 }
 
 void AddQuestion(CLI::App& verb, std::vector<std::string>& words) {

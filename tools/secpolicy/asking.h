@@ -15,7 +15,7 @@ namespace SecPolicyTool {
 
 struct AskingArguments {
   std::string host;
-  std::string policy = kKernelSource;
+  std::string policy;
   bool isJson = false;
 };
 

@@ -7,8 +7,8 @@
 
 #include "tools/graph/graph_forms.h"
 #include "tools/graph/graphviz.h"
-#include "tools/graph/output_file.h"
 #include "tools/policy/output.h"
+#include "tools/policy/output_file.h"
 #include "tools/secpolicy/event_option.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/source_option.h"

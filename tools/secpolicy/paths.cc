@@ -23,7 +23,7 @@ constexpr std::size_t kMostPaths = 1000;
 
 struct PathsArguments {
   std::string host;
-  std::string source = kKernelSource;
+  std::string source;
   std::string from;
   std::string to;
   std::optional<std::string> event;
@@ -57,10 +57,7 @@ void AddPaths(CLI::App& app, ExitStatus& status) {
   AddHostOption(*verb, arguments->host);
   AddJsonOption(*verb, arguments->isJson);
   AddEventOption(*verb, arguments->event);
-  verb->add_option("--policy", arguments->source,
-                   "A policy directory, or \"kernel\" for what the host's kernel holds")
-      ->type_name("DIR|kernel")
-      ->capture_default_str();
+  AddPolicyOption(*verb, arguments->source);
   CLI::Option* most = verb->add_option("--max", arguments->most, "At most so many paths")
                           ->type_name("N")
                           ->check(CLI::Range(std::size_t{1}, kMostPaths))

@@ -5,8 +5,8 @@
 #include <memory>
 
 #include "tools/check/check.h"
-#include "tools/graph/output_file.h"
 #include "tools/policy/output.h"
+#include "tools/policy/output_file.h"
 #include "tools/query/digest.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/source_option.h"

@@ -15,6 +15,14 @@ void AddSourceOption(CLI::App& verb, std::string& source, const std::string& nam
       ->required();
 }
 
+void AddPolicyOption(CLI::App& verb, std::string& source) {
+  source = kKernelSource;
+  verb.add_option("--policy", source,
+                  "The policy that is asked: a directory, or \"kernel\", as without it, for what "
+                  "the host's kernel holds")
+      ->type_name("DIR|kernel");
+}
+
 Policy ReadPolicy(const std::string& host, const std::string& source, OnErrors onErrors) {
   SourcePolicy read = ReadSource(OpenHost(host), source);
   if (read.errors.empty()) return std::move(read.policy);

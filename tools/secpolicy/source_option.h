@@ -11,6 +11,9 @@ namespace SecPolicyTool {
 // Adds the positional argument SOURCE, with `name` if the verb has several.
 void AddSourceOption(CLI::App& verb, std::string& source, const std::string& name = "SOURCE");
 
+// Adds "--policy SOURCE", for verbs that ask a policy: what the host's kernel holds without it.
+void AddPolicyOption(CLI::App& verb, std::string& source);
+
 // What is done with a directory of which a load reports errors.
 enum class OnErrors {
   kWarn,    // a warning on standard error; the policy is what such a load installs

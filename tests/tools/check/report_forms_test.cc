@@ -4,7 +4,7 @@
 #include "tests/tools/check/check_fixture.h"
 #include "tests/tools/schema.h"
 #include "tools/check/line_excerpt.h"
-#include "tools/check/utf8_text.h"
+#include "tools/policy/utf8_text.h"
 
 namespace SecPolicyTool {
 namespace {

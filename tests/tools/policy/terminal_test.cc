@@ -61,6 +61,7 @@ TEST(PainterTest, PaintsOrLeavesAsItIs) {
 
 TEST(PrintableTest, ControlCharactersAreShown) {
   EXPECT_EQ(Printable("a\tb\x1b[0m\x7f\n"), "a\\x09b\\x1b[0m\\x7f\\x0a");
+  EXPECT_EQ(Printable("\xC2\x9b\xFF"), "\\xc2\\x9b\\xff");
   EXPECT_EQ(Printable("gr\xC3\xBC\xC3\x9F"), "gr\xC3\xBC\xC3\x9F");
 }
 

@@ -17,8 +17,4 @@ std::size_t CharacterCount(std::string_view text);
 // `text` with U+FFFD in place of each byte that belongs to no character.
 std::string ValidText(std::string_view text);
 
-// `text` with control characters, those beyond ASCII too, and bytes that belong to no character
-// written as \xNN: what a terminal shows is as wide as the characters are many.
-std::string TerminalText(std::string_view text);
-
 }  // namespace SecPolicyTool

@@ -1,8 +1,6 @@
-#include "tools/check/utf8_text.h"
+#include "tools/policy/utf8_text.h"
 
 #include <algorithm>
-
-#include "tools/policy/terminal.h"
 
 namespace SecPolicyTool {
 
@@ -54,40 +52,6 @@ std::string ValidText(std::string_view text) {
     text.remove_prefix(std::max<std::size_t>(1, bytes));
   }
   return valid;
-}
-
-namespace {
-
-// C1 control characters, which are two bytes in UTF-8, mean something to some terminals.
-bool IsControl(std::string_view character) {
-  return character.size() == 2 && character[0] == '\xC2' &&
-         static_cast<unsigned char>(character[1]) < 0xA0;
-}
-
-std::string Escaped(std::string_view bytes) {
-  constexpr char kHex[] = "0123456789abcdef";
-  std::string text;
-  for (const char c : bytes) {
-    const auto byte = static_cast<unsigned char>(c);
-    text += std::string("\\x") + kHex[byte >> 4] + kHex[byte & 0xF];
-  }
-  return text;
-}
-
-bool IsPlain(char c) { return c >= ' ' && c <= '~'; }
-
-}  // namespace
-
-std::string TerminalText(std::string_view text) {
-  if (std::all_of(text.begin(), text.end(), IsPlain)) return std::string(text);
-  std::string shown;
-  while (!text.empty()) {
-    const std::size_t bytes = CharacterBytes(text);
-    const std::string_view part = text.substr(0, std::max<std::size_t>(1, bytes));
-    shown += bytes == 0 || IsControl(part) ? Escaped(part) : Printable(std::string(part));
-    text.remove_prefix(part.size());
-  }
-  return shown;
 }
 
 }  // namespace SecPolicyTool

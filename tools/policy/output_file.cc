@@ -1,4 +1,4 @@
-#include "tools/graph/output_file.h"
+#include "tools/policy/output_file.h"
 
 #include <fcntl.h>
 
