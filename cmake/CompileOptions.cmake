@@ -24,6 +24,10 @@ if(SECPOLICY_SANITIZE)
   target_compile_options(secpolicy_options INTERFACE
     -fsanitize=${SECPOLICY_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
   target_link_options(secpolicy_options INTERFACE -fsanitize=${SECPOLICY_SANITIZE})
+  if(SECPOLICY_SANITIZE MATCHES address)
+    # Compilers say so in different ways.
+    target_compile_definitions(secpolicy_options INTERFACE SECPOLICY_ADDRESS_SANITIZER)
+  endif()
 endif()
 
 if(SECPOLICY_COVERAGE)

@@ -14,7 +14,7 @@ namespace StandIn {
 
 namespace {
 
-constexpr mode_t kPermissionBits = S_IRWXU | S_IRWXG | S_IRWXO;
+constexpr mode_t kRights = S_IRWXU | S_IRWXG | S_IRWXO;
 
 // Throws if a call answered -1. `shown` is a function, since hardly any call fails.
 template <typename Shown>
@@ -59,7 +59,7 @@ void NewFile::Finish(std::uint64_t size, mode_t mode) {
   Check(
       ::ftruncate(fd_.Get(), static_cast<off_t>(size)), [&] { return shown_; }, "written");
   Check(
-      ::fchmod(fd_.Get(), mode & kPermissionBits), [&] { return shown_; }, "written");
+      ::fchmod(fd_.Get(), mode & kRights), [&] { return shown_; }, "written");
 }
 
 TreeWriter::TreeWriter(DirectoryRef root) : root_(std::move(root)) {}
@@ -83,7 +83,7 @@ void TreeWriter::SetDirectoryMode(const std::string& path, mode_t mode) const {
   const UniqueFd directory = OpenBeneath(root_.fd, path, O_RDONLY | O_DIRECTORY);
   const auto shown = [&] { return root_.path + path; };
   Check(directory.Get(), shown, "opened");
-  Check(::fchmod(directory.Get(), (mode & kPermissionBits) | S_IRWXU), shown, "made");
+  Check(::fchmod(directory.Get(), (mode & kRights) | S_IRWXU), shown, "made");
 }
 
 void TreeWriter::MakeSymlink(const std::string& path, const std::string& target) const {
@@ -94,8 +94,7 @@ void TreeWriter::MakeSymlink(const std::string& path, const std::string& target)
 void TreeWriter::MakeFifo(const std::string& path, mode_t mode) const {
   const Place place = Locate(path);
   place.Check(::mkfifoat(place.directory.Get(), place.name.c_str(), S_IRUSR | S_IWUSR), "made");
-  place.Check(::fchmodat(place.directory.Get(), place.name.c_str(), mode & kPermissionBits, 0),
-              "made");
+  place.Check(::fchmodat(place.directory.Get(), place.name.c_str(), mode & kRights, 0), "made");
 }
 
 void TreeWriter::MakeHardLink(const std::string& path, const std::string& target) const {

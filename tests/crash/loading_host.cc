@@ -44,7 +44,7 @@ void LoadingHost::BecomeLoad() const {
   const UniqueFd errors(
       open(Path("errors").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_APPEND | O_CLOEXEC, 0600));
   dup2(errors.Get(), STDERR_FILENO);
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(SECPOLICY_ADDRESS_SANITIZER)
   setenv("ASAN_OPTIONS", "detect_leaks=0", 1);
 #endif
   const std::string host = Host();

@@ -7,38 +7,38 @@ namespace SecPolicyFaults {
 
 namespace {
 
-enum class Reach : std::uint8_t {
+enum class CallReach : std::uint8_t {
   kOneType,    // a type of a domain's rules is logged and not shown
   kOneDomain,  // a domain is not shown, and the display ends behind the domains
   kTardisk,    // a tardisk's label is logged and not shown
   kCall,
 };
 
-struct Rule {
+struct CallRule {
   const char* scenario;  // "" for every one
   const char* what;
-  Reach reach;
+  CallReach reach;
 };
 
 // The first row that fits counts; an event that none fits ends the display.
-constexpr Rule kRules[] = {
-    {"", "get-rules ", Reach::kOneType},
-    {"", "read-file-rules ", Reach::kOneType},
-    {"display-one-domain", "domain-info ", Reach::kCall},
-    {"display-domain", "domain-info ", Reach::kCall},
-    {"", "domain-info ", Reach::kOneDomain},
-    {"", "getxattr ", Reach::kTardisk},
-    {"", "label-name ", Reach::kTardisk},
+constexpr CallRule kRules[] = {
+    {"", "get-rules ", CallReach::kOneType},
+    {"", "read-file-rules ", CallReach::kOneType},
+    {"display-one-domain", "domain-info ", CallReach::kCall},
+    {"display-domain", "domain-info ", CallReach::kCall},
+    {"", "domain-info ", CallReach::kOneDomain},
+    {"", "getxattr ", CallReach::kTardisk},
+    {"", "label-name ", CallReach::kTardisk},
 };
 
 constexpr char kDomainsFailure[] = "Error in displaying the policy for some domains";
 
-Reach ReachOf(const Scenario& scenario, const Event& event) {
-  for (const Rule& rule : kRules) {
+CallReach ReachOf(const Scenario& scenario, const Event& event) {
+  for (const CallRule& rule : kRules) {
     const bool fits = rule.scenario[0] == '\0' || scenario.name == rule.scenario;
     if (fits && event.text.starts_with(rule.what)) return rule.reach;
   }
-  return Reach::kCall;
+  return CallReach::kCall;
 }
 
 void PushOperations(const Baseline& baseline, std::size_t first, std::size_t last, Due& due) {
@@ -106,11 +106,11 @@ Due DueOfDisplay(const Scenario& scenario, const Baseline& baseline, const Failu
   const std::size_t end = baseline.run.events.size();
   const std::size_t failed = failure.event;
   switch (ReachOf(scenario, baseline.At(failed))) {
-    case Reach::kOneType:
+    case CallReach::kOneType:
       GoOn(baseline, failed, failed + 1, end, due);
       LogFailure(failure.cause, baseline, failed, due);
       return due;
-    case Reach::kOneDomain: {
+    case CallReach::kOneDomain: {
       const std::size_t next =
           FirstOf(baseline, failed + 1, {"domain-info ", "words ", "close-interface"});
       const std::size_t behind = FirstOf(baseline, failed + 1, {"words ", "close-interface"});
@@ -120,7 +120,7 @@ Due DueOfDisplay(const Scenario& scenario, const Baseline& baseline, const Failu
       due.text = kDomainsFailure;
       return due;
     }
-    case Reach::kTardisk: {
+    case CallReach::kTardisk: {
       const std::size_t behind = baseline.FirstFrom(failed, EventKind::kOperation, "label-name ");
       GoOn(baseline, failed, behind + 1, end, due);
       LogFailure(
@@ -128,7 +128,7 @@ Due DueOfDisplay(const Scenario& scenario, const Baseline& baseline, const Failu
           baseline, failed, due);
       return due;
     }
-    case Reach::kCall:
+    case CallReach::kCall:
       break;
   }
   return EndedAt(baseline, failure);

@@ -10,7 +10,7 @@
 #include "tests/faults/call_doors.h"
 #include "tests/faults/trial.h"
 
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(SECPOLICY_ADDRESS_SANITIZER)
 #include <sanitizer/lsan_interface.h>
 #endif
 
@@ -118,7 +118,7 @@ class Worker {
 
   // What a ledger of operator new does not see. It stops the whole process, so not at each fault.
   static void LookForLeaks([[maybe_unused]] const Scenario& scenario, [[maybe_unused]] Cell& cell) {
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(SECPOLICY_ADDRESS_SANITIZER)
     if (__lsan_do_recoverable_leak_check() == 0) return;
     ++cell.score.unexplained;
     Print(scenario, "any", 0, {"memory is leaked; see above"});
@@ -142,7 +142,7 @@ class ThisProcess final : public StandIn::ProcessTable {
 
 StandIn::SessionOptions OptionsHere() {
   StandIn::SessionOptions options;
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(SECPOLICY_ADDRESS_SANITIZER)
   options.visible.push_back("/proc");  // the search for leaks reads it
 #endif
   return options;

@@ -122,7 +122,7 @@ void HostTest::Fail(Operation operation, std::uint64_t call, int number) {
 StandIn::SessionOptions HostTest::Options() const {
   StandIn::SessionOptions options;
   options.visible = {PolicyDir()};
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(SECPOLICY_ADDRESS_SANITIZER)
   // The search for leaks at the process's end reads it.
   options.visible.push_back("/proc");
 #endif

@@ -92,7 +92,7 @@ Result CommandTest::Command(const Arguments& arguments,
   return RunProgram(SECPOLICY_COMMAND, arguments, [&] {
     setenv("XDG_STATE_HOME", Path("state").c_str(), 1);
     unsetenv("HOME");
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(SECPOLICY_ADDRESS_SANITIZER)
     // The search for leaks needs /proc, which a host doesn't have.
     setenv("ASAN_OPTIONS", "detect_leaks=0", 1);
 #endif

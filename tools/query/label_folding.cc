@@ -20,10 +20,10 @@ struct Tree {
 };
 
 using Trees = std::unordered_map<std::string, Tree>;
-using LabelText = std::optional<std::string>;
+using MaybeLabel = std::optional<std::string>;
 
-LabelText LabelOf(const std::optional<LabelledFile>& file) {
-  return file ? LabelText(file->label) : std::nullopt;
+MaybeLabel LabelOf(const std::optional<LabelledFile>& file) {
+  return file ? MaybeLabel(file->label) : std::nullopt;
 }
 
 bool IsAlike(const ChangedLabel& one, const ChangedLabel& other) {

@@ -16,6 +16,9 @@
 
 namespace StandIn {
 
+// The attribute that holds a file's label.
+inline constexpr char kLabel[] = "olvane.security";
+
 using ZekCtl::Kernel::PrivateCall;
 
 // An answer as text: "done"; "0xbad0011 EEXIST" for a status and its error value; "kernel: ENOSYS"

@@ -17,7 +17,6 @@ using SecPolicyTest::Outcome;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-constexpr char kLabel[] = "olvane.security";
 constexpr std::uint32_t kDefault = 1;  // the ids of the predefined labels
 constexpr std::uint32_t kTardisk = 2;
 

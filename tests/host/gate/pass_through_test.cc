@@ -10,8 +10,6 @@
 namespace StandIn {
 namespace {
 
-constexpr char kLabel[] = "olvane.security";
-
 class PassThroughTest : public GateTest {
  protected:
   PassThroughTest() { Tardisk("base.tar").File("motd", "hello\n"); }

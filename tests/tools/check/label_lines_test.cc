@@ -14,12 +14,12 @@ class LabelLinesTest : public CheckTest {
   void AddFileOfNoImage() const { StandIn::WriteBytes(Host() + "/root/etc/alien", ""); }
 };
 
-struct Line {
+struct LabelLine {
   const char* text;
   std::vector<std::string> found;
 };
 
-const Line kLines[] = {
+const LabelLine kLabelLines[] = {
     {"/etc/motd", {"1: error: incorrect no of parameters [word-count]"}},
     {"/etc/my motd conf", {"1: error: incorrect no of parameters [word-count]"}},
     {"/etc/motd cnof", {"11: error: unknown object label \"cnof\" (nearest: conf) [unknown-word]"}},
@@ -52,7 +52,7 @@ const Line kLines[] = {
 TEST_F(LabelLinesTest, EveryBadWordIsShown) {
   AddFileOfNoImage();
   Policy("fileLabels/base", "/usr/bin/ls program\n");
-  for (const Line& line : kLines) {
+  for (const LabelLine& line : kLabelLines) {
     // Behind a bad line, which ends the file for a load, too.
     for (const std::string before : {"", "one\n"}) {
       Policy("fileLabels/more", before + line.text + "\n");
@@ -73,7 +73,7 @@ TEST_F(LabelLinesTest, EveryBadWordIsShown) {
 TEST_F(LabelLinesTest, LoadMessageIsWhatALoadReports) {
   AddFileOfNoImage();
   Policy("fileLabels/base", "/usr/bin/ls program\n");
-  for (const Line& line : kLines) {
+  for (const LabelLine& line : kLabelLines) {
     Policy("fileLabels/more", std::string(line.text) + "\n");
     const std::vector<std::string> reported = LoadErrorsOf();
     std::vector<std::string> messages;
