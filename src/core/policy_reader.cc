@@ -1,11 +1,10 @@
 // The reader of policy files: lines to words, files to lines, directories to files.
 #include <algorithm>
-#include <array>
-#include <fstream>
 #include <string_view>
 #include <utility>
 
 #include "core/directory_stream.h"
+#include "core/line_reader.h"
 #include "secpolicy/secpolicy.h"
 
 namespace SecPolicy {
@@ -14,37 +13,57 @@ using Tavon::Lib::TavonException;
 
 namespace {
 
-// A line with its terminating NUL. A longer one ends the file: callers rely on that bound.
-constexpr std::size_t kLineBytes = 1024;
+using Lines = std::map<unsigned int, std::queue<std::string>>;
 
-std::queue<std::string> SplitAtSpaces(std::string_view text) {
-  std::queue<std::string> words;
+std::string_view BeforeComment(std::string_view line) { return line.substr(0, line.find('#')); }
+
+bool HasWords(std::string_view text) { return text.find_first_not_of(' ') != text.npos; }
+
+void AppendWords(std::string_view text, std::queue<std::string>& words) {
   while (!text.empty()) {
     const std::string_view word = text.substr(0, text.find(' '));
     if (!word.empty()) words.emplace(word);
     text.remove_prefix(std::min(word.size() + 1, text.size()));
   }
+}
+
+std::queue<std::string> SplitAtSpaces(std::string_view text) {
+  std::queue<std::string> words;
+  AppendWords(text, words);
   return words;
 }
 
-std::queue<std::string> WordsBeforeComment(std::string_view line) {
-  return SplitAtSpaces(line.substr(0, line.find('#')));
+// Stores the words of a line that has any. A new entry, as a rule the last, is filled where it is:
+// moving a queue takes as long as filling it.
+void Store(unsigned int number, std::string_view text, Lines& lines) {
+  const std::size_t before = lines.size();
+  const auto entry = lines.try_emplace(lines.end(), number);
+  if (lines.size() == before) {
+    entry->second = SplitAtSpaces(text);
+    return;
+  }
+  try {
+    AppendWords(text, entry->second);
+  } catch (...) {
+    lines.erase(entry);
+    throw;
+  }
 }
 
 }  // namespace
 
 std::queue<std::string> StringToQueue(std::string text) { return SplitAtSpaces(text); }
 
-std::queue<std::string> ParsePolicyLine(std::string line) { return WordsBeforeComment(line); }
+std::queue<std::string> ParsePolicyLine(std::string line) {
+  return SplitAtSpaces(BeforeComment(line));
+}
 
 void ParseFile(std::string path, std::map<unsigned int, std::queue<std::string>>& lines) {
-  std::ifstream file(path);
-  if (!file) throw TavonException("Unable to open policy file " + path);
-  std::array<char, kLineBytes> buffer{};
-  for (unsigned int number = 1; file.good(); ++number) {
-    file.getline(buffer.data(), buffer.size());
-    std::queue<std::string> words = WordsBeforeComment(buffer.data());
-    if (!words.empty()) lines.insert_or_assign(number, std::move(words));
+  LineReader file(path);
+  if (!file.IsOpen()) throw TavonException("Unable to open policy file " + path);
+  for (unsigned int number = 1; const auto line = file.Next(); ++number) {
+    const std::string_view text = BeforeComment(*line);
+    if (HasWords(text)) Store(number, text, lines);
   }
 }
 
