@@ -30,13 +30,15 @@ template <typename Type>
 void KeywordRules<Type>::AddRule(unsigned int line, std::string domainName, unsigned int domainId,
                                  std::queue<std::string> args, ZekAccessInterfaceImpl& iface) try {
   if (args.size() != Type::kWords.size() + 1) RuleSizeError();
-  Record rule;
+  // Filled where it stays: a record is a handful of strings.
+  std::list<Record> added(1);
+  Record& rule = added.front();
   rule.line = line;
   rule.domainId = domainId;
   rule.domainName = domainName;
   TakeWords(rule, args, iface);
   ValidateWords(rule, iface);
-  rules_.push_back(std::move(rule));
+  rules_.splice(rules_.end(), added);
 } catch (const TavonException& failure) {
   ThrowDomainParseError(line, domainName, failure.what());
 }

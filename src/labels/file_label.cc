@@ -26,9 +26,7 @@ bool IsLabelled(unsigned char type) {
   }
 }
 
-}  // namespace
-
-int SetFileLabel(std::string path, std::string label, ZekAccessInterfaceImpl& iface) {
+int LabelFile(const std::string& path, const std::string& label, ZekAccessInterfaceImpl& iface) {
   const int result = ReplaceLabelId(path, iface.LookupLabel(label, kObjectLabel));
   if (result < 0) {
     throw TavonException(
@@ -37,14 +35,22 @@ int SetFileLabel(std::string path, std::string label, ZekAccessInterfaceImpl& if
   return result;
 }
 
+}  // namespace
+
+int SetFileLabel(std::string path, std::string label, ZekAccessInterfaceImpl& iface) {
+  return LabelFile(path, label, iface);
+}
+
 void SetDirLabelRecursive(std::string dir, std::string label, ZekAccessInterfaceImpl& iface) {
-  SetFileLabel(dir, label, iface);
+  LabelFile(dir, label, iface);
   DirectoryStream directory(dir);
   if (!directory.IsOpen()) throw TavonException("Unable to open directory " + dir);
+  std::string path = dir + "/";
+  const std::size_t prefix = path.size();
   while (const auto entry = directory.Next()) {
     if (!IsLabelled(entry->type)) continue;
-    const std::string path = dir + "/" + entry->name;
-    SetFileLabel(path, label, iface);
+    path.replace(prefix, std::string::npos, entry->name);
+    LabelFile(path, label, iface);
     if (entry->type == DT_DIR) SetDirLabelRecursive(path, label, iface);
   }
 }
