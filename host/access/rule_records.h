@@ -3,6 +3,7 @@
 
 #include <list>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "host/module/rule.h"
@@ -69,25 +70,25 @@ constexpr bool kHasTarget = requires(Record record) {
 };
 
 template <typename Record>
-Rule ToRule(const Record& record) {
+Rule ToRule(Record record) {
   Rule rule;
   rule.line = record.line;
   rule.decision = record.grant ? Decision::kGrant : Decision::kRevoke;
   rule.words.reserve(RecordShape<Record>::kWords.size());
-  for (const auto word : RecordShape<Record>::kWords) rule.words.push_back(record.*word);
+  for (const auto word : RecordShape<Record>::kWords) rule.words.push_back(std::move(record.*word));
   if constexpr (kHasTarget<Record>) rule.targetDomain = record.targetDomainId;
   return rule;
 }
 
 template <typename Record>
-Record ToRecord(const Rule& rule, DomainId domain, const std::string& domainName) {
+Record ToRecord(Rule rule, DomainId domain, const std::string& domainName) {
   Record record;
   record.line = rule.line;
   record.domainId = domain;
   record.domainName = domainName;
   record.grant = rule.decision == Decision::kGrant;
   for (std::size_t i = 0; i < RecordShape<Record>::kWords.size(); ++i) {
-    record.*RecordShape<Record>::kWords[i] = rule.words.at(i);
+    record.*RecordShape<Record>::kWords[i] = std::move(rule.words.at(i));
   }
   if constexpr (kHasTarget<Record>) record.targetDomainId = rule.targetDomain;
   return record;

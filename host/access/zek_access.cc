@@ -22,16 +22,18 @@ std::string NameOf(const AttachedHost& host, unsigned int domainId) {
 }
 
 template <typename Record>
-void SetRule(SecurityModule& module, const Record& record) {
-  AsPlatform([&] { module.SetRule(RecordShape<Record>::kKind, record.domainId, ToRule(record)); });
+void SetRule(SecurityModule& module, Record record) {
+  const DomainId domain = record.domainId;
+  AsPlatform(
+      [&] { module.SetRule(RecordShape<Record>::kKind, domain, ToRule(std::move(record))); });
 }
 
 template <typename Record>
 void GetRules(const AttachedHost& host, unsigned int domainId, std::list<Record>& records) {
   AsPlatform([&] {
-    const std::vector<Rule> rules = host.module.Rules(RecordShape<Record>::kKind, domainId);
+    std::vector<Rule> rules = host.module.Rules(RecordShape<Record>::kKind, domainId);
     const std::string name = NameOf(host, domainId);
-    for (const Rule& rule : rules) records.push_back(ToRecord<Record>(rule, domainId, name));
+    for (Rule& rule : rules) records.push_back(ToRecord<Record>(std::move(rule), domainId, name));
   });
 }
 
@@ -99,31 +101,31 @@ std::map<std::string, long> ZekAccessInterfaceImpl::GetKeywordsMap(ZekAccess_Key
 }
 
 void ZekAccessInterfaceImpl::SetSyscallRule(ZekAccess_SyscallRule rule) {
-  SetRule(state_->module, rule);
+  SetRule(state_->module, std::move(rule));
 }
 
 void ZekAccessInterfaceImpl::SetCapabilityRule(ZekAccess_CapabilityRule rule) {
-  SetRule(state_->module, rule);
+  SetRule(state_->module, std::move(rule));
 }
 
 void ZekAccessInterfaceImpl::SetCapabilityParamRule(ZekAccess_CapabilityParamRule rule) {
-  SetRule(state_->module, rule);
+  SetRule(state_->module, std::move(rule));
 }
 
 void ZekAccessInterfaceImpl::SetObjectAccessRule(ZekAccess_ObjectAccessRule rule) {
-  SetRule(state_->module, rule);
+  SetRule(state_->module, std::move(rule));
 }
 
 void ZekAccessInterfaceImpl::SetDomTransRule(ZekAccess_DomTransRule rule) {
-  SetRule(state_->module, rule);
+  SetRule(state_->module, std::move(rule));
 }
 
 void ZekAccessInterfaceImpl::SetFileCreationRule(ZekAccess_FileCreationRule rule) {
-  SetRule(state_->module, rule);
+  SetRule(state_->module, std::move(rule));
 }
 
 void ZekAccessInterfaceImpl::SetUnixSockCreationRule(ZekAccess_UnixSockCreationRule rule) {
-  SetRule(state_->module, rule);
+  SetRule(state_->module, std::move(rule));
 }
 
 void ZekAccessInterfaceImpl::CheckCapabilityParamRuleConstraints(

@@ -3,7 +3,7 @@
 
 #include <array>
 #include <cstdint>
-#include <map>
+#include <unordered_map>
 #include <vector>
 
 #include "host/module/rule.h"
@@ -30,8 +30,8 @@ class RuleBook {
 
   [[nodiscard]] const RuleTable* TableOf(RuleKind kind, DomainId domain) const;
 
-  std::map<DomainId, DomainRules> domains_;
-  std::map<DomainId, std::uint32_t> transitionsInto_;
+  std::unordered_map<DomainId, DomainRules> domains_;
+  std::unordered_map<DomainId, std::uint32_t> transitionsInto_;
 };
 
 }  // namespace StandIn

@@ -2,7 +2,8 @@
 
 #include <array>
 #include <cerrno>
-#include <map>
+#include <string_view>
+#include <unordered_map>
 
 #include "host/module/module_error.h"
 #include "host/module/names.h"
@@ -60,10 +61,10 @@ void CheckRuleWords(RuleKind kind, const Rule& rule,
 }
 
 void CheckCapabilityContradictions(const std::string& domainName, const std::vector<Rule>& rules) {
-  std::map<std::vector<std::string>, const Rule*> first;
+  std::unordered_map<std::string_view, std::unordered_map<std::string_view, const Rule*>> first;
   for (const Rule& rule : rules) {
     CheckWordCount(RuleKind::kCapabilityParam, rule);
-    const Rule* const earlier = first.emplace(rule.words, &rule).first->second;
+    const Rule* const earlier = first[rule.words[0]].emplace(rule.words[1], &rule).first->second;
     if (earlier->decision == rule.decision) {
       continue;
     }

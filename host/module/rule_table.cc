@@ -5,7 +5,10 @@ namespace StandIn {
 namespace {
 
 std::string Joined(const std::vector<std::string>& words) {
+  std::size_t size = words.size();
+  for (const std::string& word : words) size += word.size();
   std::string joined;
+  joined.reserve(size);
   for (const std::string& word : words) {
     joined.append(word).push_back('\0');
   }
