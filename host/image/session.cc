@@ -43,6 +43,7 @@ void RefreshUnderLock(StateKeeper& keeper, const StateFile& state) {
 
 Session::Session(HostDirectory host, const SessionOptions& options)
     : host_(std::move(host)),
+      isKept_(options.kernel == SessionOptions::Kernel::kKept),
       module_(DescriptionOf(host_), processes_),
       file_(host_),
       keeper_(file_, host_.Ref().PathOf(kStateFile), module_),
@@ -50,13 +51,13 @@ Session::Session(HostDirectory host, const SessionOptions& options)
       observed_(module_, point_),
       files_(FilesOf(host_, file_)),
       attached_{observed_, point_, module_, files_} {
-  const bool isKept = options.kernel == SessionOptions::Kernel::kKept;
-  if (isKept) RefreshUnderLock(keeper_, file_);
+  if (options.kernel != SessionOptions::Kernel::kScratch) RefreshUnderLock(keeper_, file_);
   for (const Fault& fault : options.faults) faults_.Add(fault);
-  // The lock is held around everything; a fault is traced as the refusal that it stands for.
-  if (isKept) point_.Add(keeper_);
-  point_.Add(trace_);
-  point_.Add(faults_);
+  // The lock is held around everything; a fault is traced as the refusal that it stands for. What
+  // has nothing to do would cost every operation a little.
+  if (isKept_) point_.Add(keeper_);
+  if (options.trace) point_.Add(trace_);
+  if (!options.faults.empty()) point_.Add(faults_);
   const UniqueFd root = OpenDirectory(host_.Ref(), kRootDirectory);
   ChangeRoot({root.Get(), host_.Ref().PathOf(kRootDirectory)}, options.visible);
   for (const std::string& path : options.visible) attached_.visible.push_back(WithoutLinks(path));

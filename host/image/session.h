@@ -23,9 +23,10 @@ struct SessionOptions {
   std::vector<std::string> visible;
   TraceLog::Sink trace;
   std::vector<Fault> faults;
-  // Whether the kernel is the host's, or one that has just been started and is forgotten with the
-  // process: what is loaded into it changes nothing on disk.
-  enum class Kernel { kKept, kScratch } kernel = Kernel::kKept;
+  // Which kernel the process has: the host's own; one that holds what the host's does at this
+  // moment; or one that has just been started. The last two are the process's own and are forgotten
+  // with it: what is loaded into them changes nothing on disk.
+  enum class Kernel { kKept, kSnapshot, kScratch } kernel = Kernel::kKept;
 };
 
 // Turns this process into a process of the host: its root file system is the host's, its kernel has
@@ -34,7 +35,7 @@ struct SessionOptions {
 // session a process.
 //
 // Each operation on the module is kept before it reports success (see state_keeper.h), unless a
-// batch keeps many at once, or the kernel is a scratch one.
+// batch keeps many at once, or the kernel is the process's own.
 class Session {
  public:
   // Throws HostError when the host is damaged, has not been assembled, or cannot be entered here.
@@ -44,8 +45,10 @@ class Session {
   Session& operator=(const Session&) = delete;
 
   // From here to Commit, operations are kept together; see StateKeeper. A process that ends without
-  // Commit loses what the batch did.
-  void BeginBatch() { keeper_.BeginBatch(); }
+  // Commit loses what the batch did. Nothing is done where nothing is kept.
+  void BeginBatch() {
+    if (isKept_) keeper_.BeginBatch();
+  }
   void Commit() { keeper_.Commit(); }
 
   // The module behind all hooks, as the platform's libraries use it.
@@ -53,6 +56,7 @@ class Session {
 
  private:
   HostDirectory host_;
+  bool isKept_;
   ProcProcesses processes_;
   SimulatedModule module_;
   StateFile file_;

@@ -36,12 +36,10 @@ json DomainsJson(const Policy& policy, const std::optional<unsigned int>& domain
                  ZekAccessInterfaceImpl& iface) {
   json domains = json::array();
   for (const DomainRow& row : ReadDomains(iface)) {
-    const auto held = policy.domains.find(row.name);
-    // It may have been made since the policy was read.
-    if (held == policy.domains.end() || (domain && row.id != *domain)) continue;
+    if (domain && row.id != *domain) continue;
     json entry = ToJson(row);
     entry["rules"] = json::array();
-    for (const PolicyRule& rule : held->second.rules) {
+    for (const PolicyRule& rule : policy.domains.at(row.name).rules) {
       entry["rules"].push_back(RuleJson(rule));
     }
     domains.push_back(std::move(entry));
@@ -79,7 +77,9 @@ void PrintPolicy(const ShowArguments& arguments, const StandIn::ImageIndex& imag
 
 void Show(const ShowArguments& arguments) {
   const StandIn::ImageIndex image = ImageOf(OpenHost(arguments.host));
-  const auto session = EnterHost(arguments.host);
+  StandIn::SessionOptions options;
+  options.kernel = StandIn::SessionOptions::Kernel::kSnapshot;
+  const auto session = EnterHost(arguments.host, options);
   if (arguments.domain) RequireDomain(session->Module(), *arguments.domain);
   if (arguments.isJson) return PrintPolicy(arguments, image, session->Module());
   SecPolicy::DisplayPolicy(arguments.domain ? std::to_string(*arguments.domain) : "");
