@@ -1,0 +1,2 @@
+// Nothing but the libraries of the command.
+int main() { return 0; }
