@@ -7,6 +7,7 @@
 #include "tests/core/descriptors.h"
 #include "tests/core/words.h"
 #include "tests/host/image/temporary_directory.h"
+#include "tests/support/counted_memory.h"
 #include "tests/support/failing_allocations.h"
 
 namespace SecPolicyTest {
@@ -144,6 +145,22 @@ TEST_F(ParseFileTest, ManyLongLinesAreReadWhole) {
   EXPECT_EQ(Parsed(text), lines);
 }
 
+// The reader takes a file in blocks: wherever a line lies in them, it is the same line.
+TEST_F(ParseFileTest, PlaceInTheFileMakesNoDifferenceToALongLine) {
+  constexpr std::size_t kBlock = 8192;
+  const std::string longest(1023, 'w');
+  // From a line that ends at the block's end to one that begins there.
+  for (std::size_t before = kBlock - 1030; before <= kBlock + 5; before += 5) {
+    std::string text = std::string(before % 1000, ' ') + "\n";
+    unsigned int number = 2;
+    for (; text.size() + 1000 <= before; ++number) text += std::string(999, ' ') + "\n";
+    EXPECT_EQ(Parsed(text + longest + "\na b\n"),
+              (Lines{{number, {longest}}, {number + 1, {"a", "b"}}}))
+        << before;
+    EXPECT_EQ(Parsed(text + longest + "w\na b\n"), (Lines{{number, {longest}}})) << before;
+  }
+}
+
 // ---- The map -----------------------------------------------------------------------------------
 
 TEST_F(ParseFileTest, AddsToTheMapAndReplacesLinesOfTheSameNumber) {
@@ -202,6 +219,26 @@ TEST_F(ParseFileTest, ExhaustedMemoryPassesThroughAndTheFileIsClosed) {
   const unsigned int failures = FailEveryAllocationInTurn([&] { ParsedFile(file); });
   EXPECT_GT(failures, 4U);
   EXPECT_EQ(LowestFreeDescriptor(), before);
+}
+
+TEST_F(ParseFileTest, ExhaustedMemoryLeavesWholeLinesOnly) {
+  const std::string file = Write("a b\n" + std::string(100, 'v') + " " + std::string(100, 'w'));
+  const std::queue<std::string> old({"old"});
+  FailEveryAllocationInTurn([&] {
+    std::map<unsigned int, std::queue<std::string>> lines;
+    try {
+      lines[1] = old;
+      SecPolicy::ParseFile(file, lines);
+    } catch (const std::bad_alloc&) {
+      const OwnMemory uncounted;
+      for (const auto& [number, words] : LinesOf(lines)) {
+        EXPECT_TRUE(number == 1 &&
+                    (words.empty() || words == Words{"old"} || words == Words{"a", "b"}))
+            << number;
+      }
+      throw;
+    }
+  });
 }
 
 }  // namespace
