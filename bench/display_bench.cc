@@ -16,7 +16,7 @@ namespace {
 
 constexpr std::size_t kRules = 100'000;
 
-const std::string& Policy() {
+const std::string& ShownPolicy() {
   static const std::string dir = WritePolicy(Scratch(), kRules);
   return dir;
 }
@@ -28,8 +28,8 @@ void WriteTo(const std::string& path) {
 }
 
 void Display(benchmark::State& state) {
-  RunEach(state, BenchHost::Plain(), Policy(), kRules, [] {
-    SecPolicy::LoadPolicy(Policy());
+  RunEach(state, BenchHost::Plain(), ShownPolicy(), kRules, [] {
+    SecPolicy::LoadPolicy(ShownPolicy());
     WriteTo("/shown");
     ZekCtl::Security::ZekAccessInterfaceImpl iface;
     return Measure([&] { SecPolicy::DisplayPolicyDomains(iface, ""); });
@@ -38,8 +38,8 @@ void Display(benchmark::State& state) {
 BENCHMARK(Display)->Name("display/library")->UseManualTime();
 
 void SameLines(benchmark::State& state) {
-  RunEach(state, BenchHost::Plain(), Policy(), kRules, [] {
-    SecPolicy::LoadPolicy(Policy());
+  RunEach(state, BenchHost::Plain(), ShownPolicy(), kRules, [] {
+    SecPolicy::LoadPolicy(ShownPolicy());
     WriteTo("/shown");
     ZekCtl::Security::ZekAccessInterfaceImpl iface;
     SecPolicy::DisplayPolicyDomains(iface, "");

@@ -13,19 +13,19 @@
 namespace SecPolicyBench {
 namespace {
 
-constexpr std::size_t kLines = 10'000;
+constexpr std::size_t kRulesEach = 10'000;
 
 // Lines of one type; where its words give fewer, they come again.
 std::string FileOf(char type) {
   std::vector<std::string> different;
-  for (std::size_t i = 0; i < kLines; ++i) {
+  for (std::size_t i = 0; i < kRulesEach; ++i) {
     std::string line =
         type == 'r' ? "-r /srv/data/" + std::to_string(i) + " rw" : RuleLine(type, i);
     if (line.empty()) break;
     different.push_back(std::move(line));
   }
   std::string text;
-  for (std::size_t i = 0; i < kLines; ++i) text += different[i % different.size()] + "\n";
+  for (std::size_t i = 0; i < kRulesEach; ++i) text += different[i % different.size()] + "\n";
   const std::string path = Scratch() + "/rules-" + type;
   Fuzz::WriteFile(path, text);
   return path;
@@ -45,8 +45,8 @@ void ParseType(benchmark::State& state, char type) {
     policy.SetPolicyFile(file);
     policy.ParsePolicy(iface);
   }
-  state.counters["items"] = kLines;
-  state.SetItemsProcessed(state.iterations() * static_cast<std::int64_t>(kLines));
+  state.counters["items"] = kRulesEach;
+  state.SetItemsProcessed(state.iterations() * static_cast<std::int64_t>(kRulesEach));
 }
 BENCHMARK_CAPTURE(ParseType, a, 'a')->Name("parse/-a")->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(ParseType, c, 'c')->Name("parse/-c")->Unit(benchmark::kMillisecond);
