@@ -132,7 +132,8 @@ void ZekAccessInterfaceImpl::CheckCapabilityParamRuleConstraints(
     std::string domainName, std::list<ZekAccess_CapabilityParamRule> rules) {
   AsPlatform([&] {
     std::vector<Rule> list;
-    for (const ZekAccess_CapabilityParamRule& rule : rules) list.push_back(ToRule(rule));
+    list.reserve(rules.size());
+    for (ZekAccess_CapabilityParamRule& rule : rules) list.push_back(ToRule(std::move(rule)));
     state_->module.CheckCapabilityParams(domainName, list);
   });
 }

@@ -13,8 +13,8 @@ using Tavon::Misc::StrCat;
 
 namespace {
 
-std::map<std::string, long> Numbered(const std::vector<std::string>& words) {
-  std::map<std::string, long> numbered;
+std::unordered_map<std::string, long> Numbered(const std::vector<std::string>& words) {
+  std::unordered_map<std::string, long> numbered;
   for (std::size_t i = 0; i < words.size(); ++i) {
     numbered.emplace(words[i], static_cast<long>(i + 1));
   }

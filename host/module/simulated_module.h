@@ -5,6 +5,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "host/module/module_description.h"
@@ -81,8 +82,8 @@ class SimulatedModule final : public SecurityModule {
 
   const ModuleDescription description_;
   const ProcessTable& processes_;
-  std::map<WordList, std::map<std::string, long>> words_;  // all lists but kObjects
-  std::unique_ptr<ModuleState> state_;                     // never null
+  std::map<WordList, std::unordered_map<std::string, long>> words_;  // all lists but kObjects
+  std::unique_ptr<ModuleState> state_;                               // never null
 };
 
 }  // namespace StandIn

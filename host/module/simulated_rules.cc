@@ -47,7 +47,8 @@ void SimulatedModule::ValidateWord(WordList list, const std::string& word) {
 
 std::map<std::string, long> SimulatedModule::Words(WordList list) {
   RequireList(list);
-  return list == WordList::kObjects ? Labels(LabelType::kObject).Ids() : words_[list];
+  if (list == WordList::kObjects) return Labels(LabelType::kObject).Ids();
+  return {words_[list].begin(), words_[list].end()};
 }
 
 void SimulatedModule::SetRule(RuleKind kind, DomainId domain, const Rule& rule) {
