@@ -42,8 +42,9 @@ bool LineReader::Refill() {
 // Takes what one reading of the file has brought: an error later on does not lose it.
 std::size_t LineReader::ReadBehind(std::size_t kept) try {
   if (file_.sgetc() == std::filebuf::traits_type::eof()) return 0;
-  const std::streamsize room = std::min<std::streamsize>(file_.in_avail(), block_.size() - kept);
-  return static_cast<std::size_t>(file_.sgetn(block_.data() + kept, room));
+  const auto room = static_cast<std::streamsize>(block_.size() - kept);
+  return static_cast<std::size_t>(
+      file_.sgetn(block_.data() + kept, std::min(file_.in_avail(), room)));
 } catch (const std::ios_base::failure&) {
   return 0;
 }
