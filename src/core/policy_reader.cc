@@ -17,7 +17,9 @@ using Lines = std::map<unsigned int, std::queue<std::string>>;
 
 std::string_view BeforeComment(std::string_view line) { return line.substr(0, line.find('#')); }
 
-bool HasWords(std::string_view text) { return text.find_first_not_of(' ') != text.npos; }
+bool HasWords(std::string_view text) {
+  return text.find_first_not_of(' ') != std::string_view::npos;
+}
 
 void AppendWords(std::string_view text, std::queue<std::string>& words) {
   while (!text.empty()) {

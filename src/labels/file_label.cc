@@ -46,10 +46,10 @@ void SetDirLabelRecursive(std::string dir, std::string label, ZekAccessInterface
   DirectoryStream directory(dir);
   if (!directory.IsOpen()) throw TavonException("Unable to open directory " + dir);
   std::string path = dir + "/";
-  const std::size_t prefix = path.size();
+  const std::size_t nameBegin = path.size();
   while (const auto entry = directory.Next()) {
     if (!IsLabelled(entry->type)) continue;
-    path.replace(prefix, std::string::npos, entry->name);
+    path.replace(nameBegin, std::string::npos, entry->name);
     LabelFile(path, label, iface);
     if (entry->type == DT_DIR) SetDirLabelRecursive(path, label, iface);
   }
