@@ -49,7 +49,8 @@ void SetDirLabelRecursive(std::string dir, std::string label, ZekAccessInterface
   const std::size_t nameBegin = path.size();
   while (const auto entry = directory.Next()) {
     if (!IsLabelled(entry->type)) continue;
-    path.replace(nameBegin, std::string::npos, entry->name);
+    path.resize(nameBegin);
+    path += entry->name;
     LabelFile(path, label, iface);
     if (entry->type == DT_DIR) SetDirLabelRecursive(path, label, iface);
   }
