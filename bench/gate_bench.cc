@@ -1,6 +1,5 @@
 // Private calls to the kernel through the gate.
 #include <benchmark/benchmark.h>
-#include <linux/audit.h>
 #include <linux/filter.h>
 #include <linux/seccomp.h>
 #include <sys/prctl.h>
@@ -13,7 +12,6 @@
 
 #include "bench/support/host_process.h"
 #include "bench/support/rules.h"
-#include "kernel/path_resolution.h"
 #include "kernel/private_call.h"
 #include "platform/private_calls.h"
 #include "secpolicy/secpolicy.h"
@@ -116,8 +114,11 @@ void CallPathRules(benchmark::State& state) {
       rule.permission = 0x3;
       for (const std::string& path : paths) {
         unsigned int taken = 0;
-        prctl(ZekCtl::Kernel::kPrctlResolvePath, path.c_str(), rule.path);
-        SecPolicy::IssuePrivateCall(PrivateCall::kAddRules, 0, domain, &rule, 1U, &taken);
+        if (prctl(ZekCtl::Kernel::kPrctlResolvePath, path.c_str(), rule.path) != 0 ||
+            SecPolicy::IssuePrivateCall(PrivateCall::kAddRules, 0, domain, &rule, 1U, &taken) !=
+                0) {
+          throw std::runtime_error("no rule for " + path);
+        }
       }
     });
   });

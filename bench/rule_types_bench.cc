@@ -1,8 +1,6 @@
 // Parsing of each rule type: from a line's words to a rule that has been checked.
 #include <benchmark/benchmark.h>
 
-#include <algorithm>
-
 #include "bench/support/host_process.h"
 #include "bench/support/rules.h"
 #include "domain/domain_policy.h"

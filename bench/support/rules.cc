@@ -1,10 +1,7 @@
 #include "bench/support/rules.h"
 
-#include <algorithm>
-#include <array>
 #include <filesystem>
 #include <iterator>
-#include <span>
 #include <string_view>
 
 #include "fuzz/support/scratch_directory.h"
@@ -12,8 +9,6 @@
 namespace SecPolicyBench {
 
 namespace {
-
-using Words = std::span<const std::string_view>;
 
 constexpr std::string_view kCapabilities[] = {
     "chown",        "kill",       "setgid",         "setuid",    "setpcap",    "net_bind_service",
