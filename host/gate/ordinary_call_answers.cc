@@ -55,9 +55,9 @@ std::string RealPath(const std::string& path) {
 
 // Whether the caller means the label's attribute. A name that cannot be read is left to the kernel
 // to refuse.
-bool NamesLabel(std::uint64_t name) {
+bool NamesLabel(const MemoryAhead& memory, std::uint64_t name) {
   try {
-    return ReadString(name, XATTR_NAME_MAX + 1) == ZekCtl::Kernel::kLabelAttribute;
+    return memory.String(name, XATTR_NAME_MAX + 1) == ZekCtl::Kernel::kLabelAttribute;
   } catch (const BadArgument&) {
     return false;
   }
@@ -74,8 +74,9 @@ bool IsMadeVisible(const AttachedHost& host, const std::string& path) {
 // carries none. Beside the files of the image, what is made visible carries one, since on a machine
 // of its own it would lie in the same file system; and so do directories that no archive brought,
 // since the host itself makes such for what is to be visible.
-std::optional<std::string> LabelledPath(const AttachedHost& host, std::uint64_t address) {
-  const std::string path = ReadString(address, PATH_MAX);
+std::optional<std::string> LabelledPath(const AttachedHost& host, const MemoryAhead& memory,
+                                        std::uint64_t address) {
+  const std::string path = memory.String(address, PATH_MAX);
   struct stat status {};
   if (stat(path.c_str(), &status) != 0) throw BadArgument{errno};
   auto inImage = host.files.PathOf(status.st_dev, status.st_ino);
@@ -109,24 +110,28 @@ long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments)
 
 long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
   const auto& [path, name, value, size, flags, unused] = arguments;
-  return AsResult(
-      [&, path = path, name = name, value = value, size = size, flags = flags]() -> long {
-        if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_setxattr, arguments.data());
-        const auto labelledPath = LabelledPath(host, path);
-        CheckFlags(flags, labelledPath.has_value());
-        LabelId label = 0;
-        if (size != sizeof label) throw BadArgument{EINVAL};
-        ReadMemory(value, &label, sizeof label);
-        host.module.SetFileLabel(*labelledPath, label);
-        return 0;
-      });
+  return AsResult([&, path = path, name = name, value = value, size = size,
+                   flags = flags]() -> long {
+    LabelId label = 0;
+    const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}, {value, sizeof label}});
+    if (!NamesLabel(memory, name)) {
+      return SecpolicyGatePassThrough(SYS_setxattr, arguments.data());
+    }
+    const auto labelledPath = LabelledPath(host, memory, path);
+    CheckFlags(flags, labelledPath.has_value());
+    if (size != sizeof label) throw BadArgument{EINVAL};
+    memory.Read(value, &label, sizeof label);
+    host.module.SetFileLabel(*labelledPath, label);
+    return 0;
+  });
 }
 
 long AnswerGetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
   const auto& [path, name, value, size, unused1, unused2] = arguments;
   return AsResult([&, path = path, name = name, value = value, size = size]() -> long {
-    if (!NamesLabel(name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
-    const auto labelledPath = LabelledPath(host, path);
+    const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}});
+    if (!NamesLabel(memory, name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
+    const auto labelledPath = LabelledPath(host, memory, path);
     if (!labelledPath) throw BadArgument{ENODATA};
     const LabelId label = host.module.FileLabel(*labelledPath);
     if (size == 0) return sizeof label;

@@ -40,9 +40,11 @@ void WriteValue(std::uint64_t address, const Value& value) {
 void RequireCell(std::uint64_t address) { ProbeWritable(address, sizeof(std::uint32_t)); }
 
 FileRule ReadRecord(std::uint64_t address, WorldId world) {
+  const std::uint64_t permissionAddress = address + offsetof(ZekAccess_FileRule, permission);
   std::uint32_t permission = 0;
-  ReadMemory(address + offsetof(ZekAccess_FileRule, permission), &permission, sizeof permission);
-  return {world, ReadString(address, kPathBytes), permission};
+  const MemoryAhead memory({{permissionAddress, sizeof permission}, {address, kPathBytes}});
+  memory.Read(permissionAddress, &permission, sizeof permission);
+  return {world, memory.String(address, kPathBytes), permission};
 }
 
 std::vector<FileRule> ReadRecords(std::uint64_t address, std::uint32_t count, WorldId world) {

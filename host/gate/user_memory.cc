@@ -6,13 +6,15 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
-#include <vector>
 
 namespace StandIn {
 
 namespace {
 
-constexpr std::size_t kPage = 4096;  // the smallest there is
+constexpr std::size_t kPage = 4096;   // the smallest there is
+constexpr std::size_t kChunk = 1024;  // of a string; most fit into one
+
+std::size_t BytesToPageEnd(std::uint64_t address) { return kPage - address % kPage; }
 
 // Copies through the kernel, which checks every address, instead of touching the memory here.
 using Copy = ssize_t (*)(pid_t, const iovec*, unsigned long, const iovec*, unsigned long,
@@ -37,25 +39,67 @@ void WriteMemory(std::uint64_t address, const void* from, std::size_t size) {
 }
 
 void ProbeWritable(std::uint64_t address, std::size_t size) {
-  std::vector<char> content(size);
-  ReadMemory(address, content.data(), size);
-  WriteMemory(address, content.data(), size);
+  // Written over with what it holds.
+  CopyMemory(process_vm_writev, address, reinterpret_cast<void*>(address), size);
 }
 
 std::string ReadString(std::uint64_t address, std::size_t room) {
+  return MemoryAhead({}).String(address, room);
+}
+
+MemoryAhead::MemoryAhead(std::initializer_list<Piece> pieces) {
+  std::array<iovec, kPieces> here;
+  std::array<iovec, kPieces> there;
+  std::size_t count = 0;
+  for (const auto& [address, size] : pieces) {
+    Copy& copy = copies_.at(count);
+    copy.address = address;
+    copy.size = std::min({size, kMostBytes, BytesToPageEnd(address)});
+    here[count] = {copy.bytes.data(), copy.size};
+    there[count] = {reinterpret_cast<void*>(address), copy.size};
+    ++count;
+  }
+  const ssize_t result =
+      count == 0 ? 0 : process_vm_readv(getpid(), here.data(), count, there.data(), count, 0);
+  // It ends at the first piece that cannot be read; none is read in part, since none goes beyond
+  // its page.
+  std::size_t copied = result < 0 ? 0 : static_cast<std::size_t>(result);
+  for (Copy& copy : copies_) {
+    if (copy.size > copied) copied = 0;
+    copy.size = std::min(copy.size, copied);
+    copied -= copy.size;
+  }
+}
+
+std::string_view MemoryAhead::At(std::uint64_t address) const {
+  for (const Copy& copy : copies_) {
+    if (address == copy.address) return {copy.bytes.data(), copy.size};
+  }
+  return {};
+}
+
+void MemoryAhead::Read(std::uint64_t address, void* to, std::size_t size) const {
+  const std::string_view copied = At(address);
+  if (copied.size() < size) return ReadMemory(address, to, size);
+  copied.copy(static_cast<char*>(to), size);
+}
+
+std::string MemoryAhead::String(std::uint64_t address, std::size_t room) const {
   std::string text;
   text.reserve(room);  // memory runs out here or nowhere, wherever the string lies in its pages
-  std::array<char, kPage> chunk;
-  while (text.size() < room) {
-    // Up to the end of a page: the string may end just before memory that cannot be read.
-    const std::size_t toPageEnd = kPage - (address + text.size()) % kPage;
-    const std::size_t size = std::min(toPageEnd, room - text.size());
-    ReadMemory(address + text.size(), chunk.data(), size);
-    const char* end = std::find(chunk.data(), chunk.data() + size, '\0');
-    text.append(static_cast<const char*>(chunk.data()), end);
-    if (end != chunk.data() + size) return text;
+  std::array<char, kChunk> chunk;
+  std::string_view next = At(address).substr(0, room);
+  for (;;) {
+    const std::size_t end = next.find('\0');
+    text.append(next.substr(0, end));
+    if (end != std::string_view::npos) return text;
+    if (text.size() == room) throw BadArgument{ENAMETOOLONG};
+    // Up to the end of a page at most: the string may end just before memory that cannot be read.
+    const std::uint64_t from = address + text.size();
+    const std::size_t size = std::min({chunk.size(), BytesToPageEnd(from), room - text.size()});
+    ReadMemory(from, chunk.data(), size);
+    next = {chunk.data(), size};
   }
-  throw BadArgument{ENAMETOOLONG};
 }
 
 }  // namespace StandIn

@@ -220,6 +220,23 @@ TEST_F(LabelAttributeTest, NameAndPathMayEndWhereMemoryEnds) {
   });
 }
 
+// However much of a path is copied at a time.
+TEST_F(LabelAttributeTest, PathMayBeOfAnyLengthThatAKernelTakes) {
+  InHost([] {
+    for (const std::size_t length : {254U, 255U, 256U, 257U, 1278U, 1280U, 1282U, 4095U}) {
+      std::string path(length, '/');
+      path.replace(0, 4, "/etc").replace(length - 4, 4, "motd");
+      const std::uint32_t label = 2 - length % 2;
+      EXPECT_EQ(ResultText(setxattr(path.c_str(), kLabel, &label, sizeof label, XATTR_REPLACE)),
+                "0")
+          << length;
+      EXPECT_EQ(Get("/etc/motd"), std::to_string(label)) << length;
+    }
+    const std::string tooLong = "/etc" + std::string(4088, '/') + "motd";
+    EXPECT_EQ(ResultText(getxattr(tooLong.c_str(), kLabel, nullptr, 0)), "ENAMETOOLONG");
+  });
+}
+
 TEST_F(LabelAttributeTest, WithoutAHostTheKernelKnowsNoSuchAttribute) {
   Assemble();
   BehindTheGate([&] {
