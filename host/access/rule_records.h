@@ -74,7 +74,6 @@ Rule ToRule(Record record) {
   Rule rule;
   rule.line = record.line;
   rule.decision = record.grant ? Decision::kGrant : Decision::kRevoke;
-  rule.words.reserve(RecordShape<Record>::kWords.size());
   for (const auto word : RecordShape<Record>::kWords) rule.words.push_back(std::move(record.*word));
   if constexpr (kHasTarget<Record>) rule.targetDomain = record.targetDomainId;
   return rule;
@@ -88,7 +87,7 @@ Record ToRecord(Rule rule, DomainId domain, const std::string& domainName) {
   record.domainName = domainName;
   record.grant = rule.decision == Decision::kGrant;
   for (std::size_t i = 0; i < RecordShape<Record>::kWords.size(); ++i) {
-    record.*RecordShape<Record>::kWords[i] = std::move(rule.words.at(i));
+    record.*RecordShape<Record>::kWords[i] = std::move(rule.words[i]);
   }
   if constexpr (kHasTarget<Record>) record.targetDomainId = rule.targetDomain;
   return record;

@@ -4,7 +4,8 @@
 #include <array>
 #include <cstdint>
 #include <string>
-#include <vector>
+
+#include "host/module/few_words.h"
 
 namespace StandIn {
 
@@ -48,9 +49,9 @@ enum class Decision : std::uint8_t { kRevoke, kGrant };
 
 // One decision. The words are its key within a domain and kind.
 struct Rule {
-  std::uint32_t line = 0;          // in the policy file; 0 when there is none
-  std::vector<std::string> words;  // InfoOf(kind).words of them
-  DomainId targetDomain = 0;       // of transitions only
+  std::uint32_t line = 0;     // in the policy file; 0 when there is none
+  FewWords words;             // InfoOf(kind).words of them
+  DomainId targetDomain = 0;  // of transitions only
   Decision decision = Decision::kRevoke;
 };
 

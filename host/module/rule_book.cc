@@ -28,7 +28,7 @@ void RuleBook::Set(RuleKind kind, DomainId domain, const Rule& rule) {
   }
 }
 
-bool RuleBook::Holds(RuleKind kind, DomainId domain, const std::vector<std::string>& words) const {
+bool RuleBook::Holds(RuleKind kind, DomainId domain, const FewWords& words) const {
   const RuleTable* const table = TableOf(kind, domain);
   return table != nullptr && table->Holds(words);
 }

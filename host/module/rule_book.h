@@ -16,8 +16,7 @@ class RuleBook {
  public:
   // As RuleTable::Set.
   void Set(RuleKind kind, DomainId domain, const Rule& rule);
-  [[nodiscard]] bool Holds(RuleKind kind, DomainId domain,
-                           const std::vector<std::string>& words) const;
+  [[nodiscard]] bool Holds(RuleKind kind, DomainId domain, const FewWords& words) const;
   [[nodiscard]] std::vector<Rule> Rules(RuleKind kind, DomainId domain) const;
 
   // How many transitions, of all domains, lead into the domain.

@@ -1,10 +1,13 @@
 #include "host/module/rule_table.h"
 
+#include <algorithm>
+#include <string_view>
+
 namespace StandIn {
 
 namespace {
 
-std::string Joined(const std::vector<std::string>& words) {
+std::string Joined(const FewWords& words) {
   std::size_t size = words.size();
   for (const std::string& word : words) size += word.size();
   std::string joined;
@@ -15,11 +18,11 @@ std::string Joined(const std::vector<std::string>& words) {
   return joined;
 }
 
-std::vector<std::string> Separated(std::string_view joined) {
-  std::vector<std::string> words;
+FewWords Separated(std::string_view joined) {
+  FewWords words;
   while (!joined.empty()) {
     const std::size_t end = joined.find('\0');
-    words.emplace_back(joined.substr(0, end));
+    words.push_back(std::string(joined.substr(0, end)));
     joined.remove_prefix(end + 1);
   }
   return words;
@@ -28,32 +31,38 @@ std::vector<std::string> Separated(std::string_view joined) {
 }  // namespace
 
 std::optional<DomainId> RuleTable::Set(const Rule& rule) {
-  std::string words = Joined(rule.words);
-  Stored* const stored = table_.Find(words);
-  if (stored == nullptr) {
-    table_.Append({std::move(words), rule.line, rule.targetDomain, rule.decision});
+  const auto [entry, isNew] = decided_.try_emplace(
+      Joined(rule.words), Decided{next_, rule.line, rule.targetDomain, rule.decision});
+  if (isNew) {
+    ++next_;
     return std::nullopt;
   }
-  const DomainId replaced = stored->targetDomain;
-  stored->line = rule.line;
-  stored->targetDomain = rule.targetDomain;
-  stored->decision = rule.decision;
+  Decided& decided = entry->second;
+  const DomainId replaced = decided.targetDomain;
+  decided = {decided.place, rule.line, rule.targetDomain, rule.decision};
   return replaced;
 }
 
-bool RuleTable::Holds(const std::vector<std::string>& words) const {
-  return table_.Find(Joined(words)) != nullptr;
-}
+bool RuleTable::Holds(const FewWords& words) const { return decided_.contains(Joined(words)); }
 
 std::size_t RuleTable::DropTarget(DomainId target) {
-  return table_.EraseIf([target](const Stored& stored) { return stored.targetDomain == target; });
+  return std::erase_if(decided_,
+                       [target](const auto& entry) { return entry.second.targetDomain == target; });
 }
 
 std::vector<Rule> RuleTable::Rules() const {
+  using Entry = decltype(decided_)::value_type;
+  std::vector<const Entry*> entries;
+  entries.reserve(decided_.size());
+  for (const Entry& entry : decided_) entries.push_back(&entry);
+  std::sort(entries.begin(), entries.end(),
+            [](const Entry* a, const Entry* b) { return a->second.place < b->second.place; });
+
   std::vector<Rule> rules;
-  rules.reserve(table_.Size());
-  for (const Stored& stored : table_.Records()) {
-    rules.push_back({stored.line, Separated(stored.words), stored.targetDomain, stored.decision});
+  rules.reserve(entries.size());
+  for (const auto* entry : entries) {
+    const auto& [words, decided] = *entry;
+    rules.push_back({decided.line, Separated(words), decided.targetDomain, decided.decision});
   }
   return rules;
 }

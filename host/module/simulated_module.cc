@@ -28,7 +28,7 @@ SimulatedModule::SimulatedModule(ModuleDescription description, const ProcessTab
       processes_(processes),
       state_(std::make_unique<ModuleState>(description_)) {
   for (const auto& [list, words] : description_.words) {
-    words_.emplace(list, Numbered(words));
+    words_.at(static_cast<std::size_t>(list)) = Numbered(words);
   }
 }
 

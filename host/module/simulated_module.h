@@ -1,6 +1,7 @@
 // The security module, simulated: it decides and remembers as a kernel would, and enforces nothing.
 #pragma once
 
+#include <array>
 #include <map>
 #include <memory>
 #include <optional>
@@ -12,6 +13,7 @@
 #include "host/module/module_state.h"
 #include "host/module/process_table.h"
 #include "host/module/security_module.h"
+#include "host/module/word_lists.h"
 
 namespace StandIn {
 
@@ -75,15 +77,21 @@ class SimulatedModule final : public SecurityModule {
   std::string Tardisk(TardiskWord word) override;
 
  private:
+  using NumberedWords = std::unordered_map<std::string, long>;
+
   [[nodiscard]] WorldId Self() const;
   [[nodiscard]] std::uint32_t WorldsIn(DomainId domain) const;
   [[nodiscard]] LabelTable& Labels(LabelType type) const;
+  // That of kObjects, which is kept elsewhere, is empty.
+  [[nodiscard]] const NumberedWords& WordsOf(WordList list) const {
+    return words_[static_cast<std::size_t>(list)];
+  }
   void CheckFileRule(DomainId domain, const FileRule& rule) const;
 
   const ModuleDescription description_;
   const ProcessTable& processes_;
-  std::map<WordList, std::unordered_map<std::string, long>> words_;  // all lists but kObjects
-  std::unique_ptr<ModuleState> state_;                               // never null
+  std::array<NumberedWords, kWordLists.size() + 1> words_;  // by WordList, which counts from 1
+  std::unique_ptr<ModuleState> state_;                      // never null
 };
 
 }  // namespace StandIn

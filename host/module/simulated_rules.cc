@@ -36,7 +36,7 @@ void SimulatedModule::ValidateWord(WordList list, const std::string& word) {
     }
     return;
   }
-  if (!words_[list].contains(word)) {
+  if (!WordsOf(list).contains(word)) {
     const auto words = description_.words.find(list);
     throw ModuleError(EINVAL,
                       UnknownWordText(list, word,
@@ -48,7 +48,7 @@ void SimulatedModule::ValidateWord(WordList list, const std::string& word) {
 std::map<std::string, long> SimulatedModule::Words(WordList list) {
   RequireList(list);
   if (list == WordList::kObjects) return Labels(LabelType::kObject).Ids();
-  return {words_[list].begin(), words_[list].end()};
+  return {WordsOf(list).begin(), WordsOf(list).end()};
 }
 
 void SimulatedModule::SetRule(RuleKind kind, DomainId domain, const Rule& rule) {

@@ -23,7 +23,8 @@ std::string WordListWord(WordList list) {
 }
 
 std::string RuleWords(RuleKind kind, const Rule& rule) {
-  std::string text = std::string(InfoOf(kind).keyword) + " " + Join(rule.words);
+  std::string text =
+      std::string(InfoOf(kind).keyword) + " " + Join({rule.words.begin(), rule.words.end()});
   text += rule.decision == Decision::kGrant ? " grant" : " revoke";
   std::string comment;
   if (rule.line != 0) comment += " line " + std::to_string(rule.line);

@@ -15,7 +15,7 @@ namespace {
 
 PolicyRule ToPolicyRule(RuleKind kind, const Rule& rule) {
   PolicyRule held;
-  held.key = {TypeOf(kind), rule.words, 0};
+  held.key = {TypeOf(kind), {rule.words.begin(), rule.words.end()}, 0};
   held.isGranted = rule.decision == Decision::kGrant;
   if (rule.line != 0) held.place = Place{"", rule.line, 0};
   return held;

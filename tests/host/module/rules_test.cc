@@ -161,6 +161,15 @@ TEST_F(ModuleTest, ARuleWithAWrongNumberOfWordsIsRefused) {
             "EINVAL: a rule \"-f\" has 3 words, not 2");
 }
 
+TEST(FewWords, HoldsThreeAndNoMore) {
+  FewWords words{"a", "b"};
+  words.push_back("c");
+  EXPECT_EQ(words, (FewWords{"a", "b", "c"}));
+  EXPECT_THROW(words.push_back("d"), std::length_error);
+  EXPECT_THAT(std::vector<std::string>(words.begin(), words.end()), ElementsAre("a", "b", "c"));
+  EXPECT_FALSE((words == FewWords{"a", "b"}));
+}
+
 TEST_F(ModuleTest, AParameterWithANulIsRefused) {
   const std::string parameter("8\0", 2);
   EXPECT_EQ(RefusalOf([&] {
