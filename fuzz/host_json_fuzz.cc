@@ -2,10 +2,10 @@
 // file; a good one makes a module whose fresh state can be saved and restored.
 #include "fuzz/support/input.h"
 #include "fuzz/support/require.h"
-#include "host/host_error.h"
 #include "host/module/description_json.h"
 #include "host/module/module_error.h"
 #include "host/module/simulated_module.h"
+#include "secpolicy/host/host_error.h"
 #include "tests/support/memory_host.h"
 
 namespace {

@@ -3,7 +3,7 @@
 #include "fuzz/support/input.h"
 #include "fuzz/support/require.h"
 #include "fuzz/support/small_world.h"
-#include "host/host_error.h"
+#include "secpolicy/host/host_error.h"
 
 namespace {
 

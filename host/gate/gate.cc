@@ -14,7 +14,7 @@
 #include "host/gate/private_call_answers.h"
 #include "host/gate/trap_filter.h"
 #include "host/gate/trapped_call.h"
-#include "host/host_error.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

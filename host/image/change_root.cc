@@ -11,9 +11,9 @@
 #include <filesystem>
 #include <string_view>
 
-#include "host/host_error.h"
 #include "host/image/system_failure.h"
 #include "host/image/unique_fd.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

@@ -4,10 +4,10 @@
 #include <utility>
 
 #include "host/gate/gate.h"
-#include "host/host_error.h"
 #include "host/image/change_root.h"
 #include "host/image/system_failure.h"
 #include "host/module/description_json.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

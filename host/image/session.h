@@ -15,6 +15,7 @@
 #include "host/trace/fault_plan.h"
 #include "host/trace/observed_module.h"
 #include "host/trace/trace_log.h"
+#include "secpolicy/host/entered_host.h"
 
 namespace StandIn {
 
@@ -23,10 +24,8 @@ struct SessionOptions {
   std::vector<std::string> visible;
   TraceLog::Sink trace;
   std::vector<Fault> faults;
-  // Which kernel the process has: the host's own; one that holds what the host's does at this
-  // moment; or one that has just been started. The last two are the process's own and are forgotten
-  // with it: what is loaded into them changes nothing on disk.
-  enum class Kernel { kKept, kSnapshot, kScratch } kernel = Kernel::kKept;
+  using Kernel = EnterOptions::Kernel;
+  Kernel kernel = Kernel::kKept;
 };
 
 // Turns this process into a process of the host: its root file system is the host's, its kernel has

@@ -3,8 +3,8 @@
 #include <cerrno>
 #include <utility>
 
-#include "host/host_error.h"
 #include "host/module/module_error.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

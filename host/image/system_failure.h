@@ -4,7 +4,7 @@
 #include <cstring>
 #include <string>
 
-#include "host/host_error.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

@@ -9,9 +9,9 @@
 #include <string>
 #include <string_view>
 
-#include "host/host_error.h"
 #include "host/image/unpack_budget.h"
 #include "host/image/unpacked_stream.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

@@ -5,8 +5,8 @@
 #include <set>
 #include <string_view>
 
-#include "host/host_error.h"
 #include "platform/tavon_strcat.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

@@ -5,10 +5,10 @@
 #include <cerrno>
 #include <filesystem>
 
-#include "host/host_error.h"
 #include "host/image/file_io.h"
 #include "host/image/system_failure.h"
 #include "host/image/unique_fd.h"
+#include "secpolicy/host/host_error.h"
 #include "tools/policy/terminal.h"
 
 namespace SecPolicyTool {

@@ -3,9 +3,9 @@
 #include <cstdlib>
 #include <filesystem>
 
-#include "host/host_error.h"
 #include "host/image/assemble.h"
 #include "host/module/description_json.h"
+#include "secpolicy/host/host_error.h"
 
 namespace SecPolicyTool {
 

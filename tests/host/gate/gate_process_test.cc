@@ -13,9 +13,9 @@
 #include <thread>
 
 #include "host/attached_host.h"
-#include "host/host_error.h"
 #include "host/image/image_index.h"
 #include "host/trace/observed_module.h"
+#include "secpolicy/host/host_error.h"
 #include "tests/host/gate/gate_fixture.h"
 #include "tests/host/module/module_fixture.h"
 

@@ -6,7 +6,7 @@
 #include <sys/resource.h>
 #include <sys/stat.h>
 
-#include "host/host_error.h"
+#include "secpolicy/host/host_error.h"
 #include "tests/host/image/child_process.h"
 #include "tests/host/image/temporary_directory.h"
 

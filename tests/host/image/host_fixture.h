@@ -9,10 +9,10 @@
 #include <set>
 #include <string>
 
-#include "host/host_error.h"
 #include "host/image/assemble.h"
 #include "host/image/host_directory.h"
 #include "host/image/root_index.h"
+#include "secpolicy/host/host_error.h"
 #include "tests/host/image/archives.h"
 #include "tests/host/image/temporary_directory.h"
 

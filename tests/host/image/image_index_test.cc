@@ -3,7 +3,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "host/host_error.h"
+#include "secpolicy/host/host_error.h"
 #include "tests/host/image/temporary_directory.h"
 
 namespace StandIn {

@@ -6,7 +6,7 @@
 #include <functional>
 #include <tuple>
 
-#include "host/host_error.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 namespace {

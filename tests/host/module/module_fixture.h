@@ -11,10 +11,10 @@
 #include <string>
 #include <vector>
 
-#include "host/host_error.h"
 #include "host/module/description_json.h"
 #include "host/module/module_error.h"
 #include "host/module/simulated_module.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 

@@ -8,7 +8,7 @@ namespace StandIn {
 
 // Thrown when a host directory, a file of it, an archive, or this machine's own facilities do not
 // allow what was asked. `what()` names the file and the place in it. Nothing was changed.
-class HostError : public std::runtime_error {
+class [[gnu::visibility("default")]] HostError : public std::runtime_error {
  public:
   using std::runtime_error::runtime_error;
 };
