@@ -2,11 +2,12 @@
 # secpolicy_options.
 
 find_program(CCACHE_PROGRAM ccache)
-if(CCACHE_PROGRAM)
+if(CCACHE_PROGRAM AND NOT DEFINED CMAKE_CXX_COMPILER_LAUNCHER)
   set(CMAKE_CXX_COMPILER_LAUNCHER ${CCACHE_PROGRAM})
 endif()
 
 add_library(secpolicy_options INTERFACE)
+target_compile_features(secpolicy_options INTERFACE cxx_std_20)
 target_compile_options(secpolicy_options INTERFACE
   -Wall -Wextra -Wpedantic -Wshadow -Wconversion -Wnon-virtual-dtor -Woverloaded-virtual)
 
