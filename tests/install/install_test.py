@@ -268,6 +268,28 @@ class Consumer(Installed):
                               "-DCMAKE_UNITY_BUILD=ON")
         self.check(consumer)
 
+    def test_as_documented(self) -> None:
+        document = (SOURCE / "docs" / "installing.md").read_text()
+        blocks = re.findall(r"^```(\w+)\n(.*?)^```$", document, re.MULTILINE | re.DOTALL)
+        program, = (text for language, text in blocks if language == "cpp")
+        installed, _ = (text for language, text in blocks if language == "cmake")
+        command = next(text for language, text in blocks if "pkg-config" in text)
+        (self.place / "program.cc").write_text(program)
+        (self.place / "CMakeLists.txt").write_text(
+            "cmake_minimum_required(VERSION 3.25)\nproject(Documented LANGUAGES CXX)\n" + installed)
+        build = self.place / "build"
+        run(CMAKE, "-S", self.place, "-B", build, f"-DCMAKE_CXX_COMPILER={COMPILER}",
+            f"-DCMAKE_PREFIX_PATH={self.prefix}")
+        run(CMAKE, "--build", build)
+        run("sh", "-ec", f'cd "$1"\n{command.replace("c++", COMPILER, 1)}', "sh", self.place,
+            PKG_CONFIG_PATH=self.prefix / LIBDIR / "pkgconfig")
+        host = self.place / "host"
+        self.command("host", "init", host)
+        self.command("host", "assemble", host)
+        shown = self.command("show", "--host", host).stdout
+        for made in (build / "program", self.place / "program"):
+            self.assertEqual(run(made, host, **self.loader()).stdout, shown)
+
     def test_an_older_program_does_not_take_a_version_that_broke_something(self) -> None:
         project = self.place / "project"
         project.mkdir()
