@@ -38,8 +38,10 @@ foreach(symbol IN LISTS symbols)
       list(APPEND exported ${CMAKE_MATCH_1})
     elseif(name MATCHES "^SecPolicy::SecPolicyRetryException::")
       # Its constructors and its destructor.
-    elseif(name MATCHES "^(vtable|typeinfo|typeinfo name) for (SecPolicy::SecPolicyRetryException|Tavon::Lib::TavonException)$")
+    elseif(name MATCHES "^(vtable|typeinfo|typeinfo name) for (SecPolicy::SecPolicyRetryException|Tavon::Lib::TavonException)(@@|$)")
       # By which the exceptions are caught on the other side.
+    elseif(kind STREQUAL "A" AND name MATCHES "^SECPOLICY_[0-9]+(@@|$)")
+      # A version of the interface.
     elseif(kind MATCHES "[WuVv]" AND NOT name MATCHES "(SecPolicy|ZekCtl|StandIn)::")
       # Inline functions of the standard library and of the platform's headers.
     else()
