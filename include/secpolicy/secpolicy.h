@@ -35,10 +35,12 @@ using ZekCtl::Security::ZekAccessLabelType;
 // the call with a larger array.
 class SecPolicyRetryException : public Tavon::Lib::TavonException {
  public:
+  // Keeps a copy of the text; the structured message is empty.
   explicit SecPolicyRetryException(const std::string& message);
   // Keeps the structured message as well; it is shared, not copied.
   SecPolicyRetryException(const std::string& message,
                           const Tavon::Lib::KestMessage& structuredMessage);
+  // Copies the text; the structured message is shared.
   SecPolicyRetryException(const SecPolicyRetryException& other);
   ~SecPolicyRetryException() override;
 };
@@ -64,10 +66,14 @@ void LoadPolicy(std::string dir);
 // DisplayPolicyDomains), the objects, the tardisks and their labels. Catches nothing.
 void DisplayPolicy(std::string selector);
 
-// Kernel ids of globalVMDom, ioFilterDom and appDom as the process's last load found them; 0
-// before. A load that ends before it looks them up leaves them as they are.
+// Kernel id of globalVMDom as the process's last load found it; 0 before. A load that ends before
+// it looks the domain up leaves the id as it is.
 unsigned int GetGlobalVMDomain();
+
+// The same for ioFilterDom.
 unsigned int GetIOFilterDomain();
+
+// The same for appDom.
 unsigned int GetDefaultTardiskDomain();
 
 // ---- Reading policy files ------------------------------------------------------------------
@@ -109,9 +115,11 @@ void SecpolicyError(std::string msg);
 // dashes as long as the longer text. Each line is flushed.
 void DisplayHeader(std::string first, std::string second);
 
-// Throw "Error in parsing policy for domain: " or "Error in setting policy for domain: ", followed
-// by domain + ": " + line + " : " + cause. `line` is the line in the policy file.
+// Throws "Error in parsing policy for domain: " + domain + ": " + line + " : " + cause. `line` is
+// the line in the policy file.
 [[noreturn]] void ThrowDomainParseError(unsigned int line, std::string domain, std::string cause);
+
+// Throws "Error in setting policy for domain: " + domain + ": " + line + " : " + cause.
 [[noreturn]] void ThrowDomainSetError(unsigned int line, std::string domain, std::string cause);
 
 // ---- Stages --------------------------------------------------------------------------------
@@ -184,8 +192,11 @@ std::vector<std::string> GetObsoleteLabels(std::vector<std::string> policyLabels
                                            std::map<std::string, long> existing,
                                            ZekAccessLabelType type, ZekAccessInterfaceImpl& iface);
 
-// Log a heading and each label on a line of its own; nothing for an empty list.
+// Logs the heading of removed labels of this type, and each label on a line of its own; nothing for
+// an empty list.
 void PrintObsoleteLabels(std::vector<std::string> labels, ZekAccessLabelType type);
+
+// The same under the heading of labels whose values have been changed.
 void PrintInvalidLabels(std::vector<std::string> labels, ZekAccessLabelType type);
 
 // ---- File labels ---------------------------------------------------------------------------

@@ -21,12 +21,15 @@ enum class PrivateCall : long {
   kDomainName = 16487,     // domain id, address of the name's buffer, its length
   kReplacePath = 16488,    // old path, new path
 
-  kFirst = kCreateDomain,
-  kLast = kReplacePath,
+  kFirst = kCreateDomain,  // the lowest number of the module's calls
+  kLast = kReplacePath,    // the highest
 };
 
 // The second argument of kCreateDomain.
-enum class DomainOrigin : unsigned int { kPolicy = 0, kRunTime = 1 };
+enum class DomainOrigin : unsigned int {
+  kPolicy = 0,   // created by the load of a policy
+  kRunTime = 1,  // created by a program; leaked when its maker ends and no world is in it
+};
 
 // Status of kReadRules when the caller's array is too small for the domain's table.
 inline constexpr long kStatusTableTooSmall = 0x0bad011f;
@@ -37,8 +40,9 @@ inline constexpr int kPrctlResolvePath = 4109;
 // Extended attribute that holds a file's label: the label's id, 4 bytes in native byte order.
 inline constexpr char kLabelAttribute[] = "olvane.security";
 
-// Bytes of a file rule's path and of a domain's name, the terminating NUL included.
+// Room for a file rule's path in bytes, the terminating NUL included.
 inline constexpr std::size_t kPathBytes = 1984;
+// Room for a domain's name in bytes, the terminating NUL included.
 inline constexpr std::size_t kDomainNameBytes = 128;
 
 }  // namespace ZekCtl::Kernel

@@ -13,7 +13,7 @@ inline constexpr std::uint16_t kInodeStatsNode = 0x0417;
 
 // The reply of kInodeStatsNode.
 struct InodeStats {
-  char reserved[32];
+  char reserved[32];  // the service's own
   // Name of the tardisk that holds the inode, NUL-terminated; empty when none does.
   char tardiskName[512];
 };

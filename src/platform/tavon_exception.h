@@ -20,6 +20,7 @@ class [[gnu::visibility("default")]] KestMessage {
   explicit KestMessage(std::shared_ptr<const void> content) noexcept
       : content_(std::move(content)) {}
 
+  // True for a message without content.
   [[nodiscard]] bool Empty() const noexcept { return content_ == nullptr; }
 
   // How many handles share the content; 0 for an empty message.
@@ -33,14 +34,17 @@ class [[gnu::visibility("default")]] KestMessage {
 // text for a person; nothing needs to be added to it.
 class [[gnu::visibility("default")]] TavonException : public std::exception {
  public:
-  // Keep a copy of the text; the structured message is empty.
+  // Keeps a copy of the text; the structured message is empty.
   explicit TavonException(const std::string& message) : message_(message) {}
+  // The same for a NUL-terminated text, which must not be a null pointer.
   explicit TavonException(const char* message) : message_(message) {}
 
+  // Copies the text; the structured message is shared.
   TavonException(const TavonException&) = default;
-  TavonException(TavonException &&) = default;
+  TavonException(TavonException &&) = default;  // takes text and message over
+  // Copies the text; the structured message is shared.
   TavonException& operator=(const TavonException&) = default;
-  TavonException& operator=(TavonException&&) = default;
+  TavonException& operator=(TavonException&&) = default;  // takes text and message over
   ~TavonException() override = default;
 
   // Valid as long as this exception lives.
@@ -50,6 +54,7 @@ class [[gnu::visibility("default")]] TavonException : public std::exception {
   [[nodiscard]] const KestMessage& StructuredMessage() const noexcept { return structuredMessage_; }
 
  protected:
+  // Keeps a copy of the text, and shares the structured message.
   TavonException(const std::string& message, const KestMessage& structuredMessage)
       : message_(message), structuredMessage_(structuredMessage) {}
 

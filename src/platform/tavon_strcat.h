@@ -9,6 +9,7 @@ namespace Tavon::Misc {
 
 namespace Internal {
 
+// Text is taken as it is.
 inline void Append(std::string& text, std::string_view part) { text.append(part); }
 
 // A character is text, not a number.
