@@ -1,0 +1,40 @@
+"""What the documentation site is made of; read by Sphinx from scripts/site."""
+
+import pathlib
+import re
+
+REPOSITORY = pathlib.Path(__file__).resolve().parent.parent.parent
+
+project = "libsecpolicy"
+release = re.search(r"project\(SecPolicy VERSION (\S+)",
+                    (REPOSITORY / "CMakeLists.txt").read_text())[1]
+html_title = f"{project} {release}"
+
+extensions = ["myst_parser", "breathe"]
+source_suffix = {".md": "markdown"}
+root_doc = "index"
+language = "en"
+# Texts of messages are quoted to the letter.
+smartquotes = False
+
+# Headings are targets under the names that Git hosts give them.
+myst_heading_anchors = 4
+
+breathe_default_project = "secpolicy"
+breathe_domain_by_extension = {"h": "cpp"}
+breathe_domain_by_file_pattern = {"*_c.h": "c"}
+breathe_show_include = False
+
+pygments_style = "default"
+pygments_dark_style = "github-dark"
+highlight_language = "none"
+
+# Light and dark as the reader's system has it, narrow screens, and no font from elsewhere.
+html_theme = "furo"
+html_theme_options = {"navigation_with_keys": True}
+html_static_path = [str(pathlib.Path(__file__).parent / "static")]
+html_css_files = ["site.css"]
+html_copy_source = False
+html_show_sourcelink = False
+html_show_sphinx = False
+html_show_copyright = False

@@ -1,0 +1,124 @@
+"""The reference of the headers that programs and platforms include."""
+
+import itertools
+import pathlib
+import re
+import subprocess
+import xml.etree.ElementTree as ElementTree
+
+from documents import SiteError
+
+# Folders of headers in the order in which they are shown, as they are included.
+FOLDERS = ["include/secpolicy", "include/secpolicy/host", "src/platform"]
+
+
+def undocumented_enumerators(xml):
+    """Those that Doxygen lets pass."""
+    for file in sorted(xml.glob("*.xml")):
+        for value in ElementTree.parse(file).iter("enumvalue"):
+            texts = [value.find(part) for part in ("briefdescription", "detaileddescription")]
+            if not any("".join(text.itertext()).strip() for text in texts):
+                yield value.findtext("name")
+
+
+def leave_out_private(xml):
+    """What stands behind "private:" is nobody's but the class's."""
+    for file in [*xml.glob("class*.xml"), *xml.glob("struct*.xml")]:
+        tree = ElementTree.parse(file)
+        for compound in tree.getroot().iter("compounddef"):
+            for section in compound.findall("sectiondef"):
+                if section.get("kind", "").startswith("private"):
+                    compound.remove(section)
+        tree.write(file, encoding="utf-8", xml_declaration=True)
+
+
+def described(repository, out):
+    """Has Doxygen read the headers; its XML, in `out`. Throws SiteError for what it complains of."""
+    settings = (repository / "docs/site/Doxyfile").read_text()
+    pathlib.Path(out).mkdir(parents=True, exist_ok=True)
+    try:
+        made = subprocess.run(["doxygen", "-"], input=f"{settings}\nOUTPUT_DIRECTORY = {out}\n",
+                              cwd=repository, capture_output=True, text=True)
+    except FileNotFoundError:
+        raise SiteError("doxygen is not installed") from None
+    if made.returncode != 0 or made.stderr:
+        raise SiteError(f"Doxygen:\n{made.stderr}")
+    xml = pathlib.Path(out) / "xml"
+    bare = sorted(set(undocumented_enumerators(xml)))
+    if bare:
+        raise SiteError(f"enumerators are not documented: {', '.join(bare)}")
+    return xml
+
+
+# ---- Pages ---------------------------------------------------------------------------------------
+
+
+def compound(file):
+    return ElementTree.parse(file).getroot().find("compounddef")
+
+
+def directive(kind, name, *options):
+    return f"```{{eval-rst}}\n.. doxygen{kind}:: {name}\n{''.join(options)}```\n"
+
+
+class Namespace:
+    """A namespace's types, and its other names by their titles in the headers."""
+
+    def __init__(self, file, xml):
+        found = compound(file)
+        self.name = found.findtext("compoundname")
+        self.places = set()
+        self.parts = []
+        types = [compound(xml / f"{inner.get('refid')}.xml") for inner in found.findall("innerclass")]
+        if types:
+            self.parts.append("## Types\n")
+        for one in sorted(types, key=lambda one: int(one.find("location").get("line"))):
+            self.add(one, one.get("kind"), one.findtext("compoundname"), "   :members:\n")
+        for section in found.findall("sectiondef"):
+            if section.find("header") is not None:
+                text = "".join(section.find("description").itertext()) if section.find(
+                    "description") is not None else ""
+                self.parts.append(f"## {section.findtext('header')}\n\n{text}\n")
+            for member in section.findall("memberdef"):
+                self.add(member, member.get("kind"), f"{self.name}::{member.findtext('name')}")
+
+    def add(self, described, kind, name, *options):
+        self.places.add(described.find("location").get("file"))
+        self.parts.append(directive(kind, name, *options))
+
+    def is_shown(self):
+        return bool(self.parts) and not self.name.endswith("::Internal")
+
+
+def headers(repository):
+    """All headers in their order: what one writes to include them, and the text at their top."""
+    for folder in FOLDERS:
+        for path in sorted((repository / folder).glob("*.h")):
+            top = itertools.takewhile(lambda line: line.startswith("//"),
+                                      path.read_text().splitlines())
+            text = "\n".join(re.sub("^// ?", "", line) for line in top)
+            yield str(path.relative_to(repository / folder.split("/")[0])), text
+
+
+def stage(repository, xml, source):
+    """Writes a page for each namespace and each header without one, and one that lists them."""
+    leave_out_private(xml)
+    namespaces = [Namespace(file, xml) for file in sorted(xml.glob("namespace*.xml"))
+                  if not file.name.endswith("_8dox.xml")]
+    texts = {}
+    for header, text in headers(repository):
+        shown = [one for one in namespaces if header in one.places and one.is_shown()]
+        for one in shown:
+            texts.setdefault(one.name, [[], one.parts])[0].append(f"`<{header}>`: {text}\n")
+        if not shown:
+            texts[header] = [[f"{text}\n"], [directive("file", header)]]
+    (source / "reference").mkdir()
+    index = [(repository / "docs/site/reference.md").read_text(), ""]
+    names = []
+    for title, (tops, parts) in texts.items():
+        names.append(title.replace("::", "-").replace("/", "-").removesuffix(".h"))
+        (source / f"reference/{names[-1]}.md").write_text(
+            "\n".join([f"# {title}\n", *tops, *parts]))
+        index.append(f"- [{title}]({names[-1]}.md)")
+    index += ["", "```{toctree}", ":hidden:", "", *names, "```", ""]
+    (source / "reference/index.md").write_text("\n".join(index))
