@@ -141,6 +141,16 @@ POLICY = {
 }
 
 
+TARDISKS = {
+    "tardisks/plain.tar": "",
+    "tardisks/vendor.tar": "",
+    "etc/olvane/secpolicy/tardisks/vendor": "# for the vendor's programs\n-E vendorFile globalVMDom\n",
+    "policy/objects/base": "",
+    "policy/domains/appDom": "",
+    "policy/fileLabels/base": "",
+}
+
+
 class Load(PlatformTest):
     """The library, installed, between a program and a platform that records what it is asked."""
 
@@ -191,6 +201,18 @@ class Load(PlatformTest):
     def test_a_domain_that_is_not_there_is_asked_of_the_kernel_itself(self) -> None:
         more = {**POLICY, "domains/moreDom": "-s openat grant\n"}
         self.check(self.loader(), self.write("more", more), "unknown_domain.txt")
+
+    def test_tardisks_are_asked_for_where_a_host_has_them(self) -> None:
+        """In a root directory of its own, for which the program has to be whole in itself."""
+        root = self.write("root", TARDISKS)
+        done(COMPILER, *FLAGS, "-static", f"-I{SOURCE / 'src'}", f"-I{self.prefix / 'include'}",
+             HERE / "loader.cc", HERE / "recorder.cc", self.prefix / "lib" / "libsecpolicy.a",
+             "-o", root / "loader")
+        enter = ["chroot"] if os.geteuid() == 0 else ["unshare", "--map-root-user", "--root"]
+        shown = done(*enter, root, "/loader", "/policy")
+        # A display goes by the order of the directory.
+        load, _, _ = shown.stderr.partition("show\n")
+        self.assertEqual(load, (HERE / "tardisks.txt").read_text())
 
     def test_the_library_alone_is_installed(self) -> None:
         names = {path.relative_to(self.prefix).as_posix() for path in self.prefix.rglob("*")
