@@ -1,8 +1,11 @@
 // The stand-in host, for programs that use the library without a target: a process enters a host
 // directory, and from there on the library's calls are answered by that host.
 //
-//   const StandIn::EnteredHost host("/var/tmp/host");  // made by "secpolicy host init" and
-//   assembled SecPolicy::LoadPolicy("/etc/olvane/secpolicy");    // a path inside the host
+//     const StandIn::EnteredHost host("/var/tmp/host");
+//     SecPolicy::LoadPolicy("/etc/olvane/secpolicy");
+//
+// The host directory is one that "secpolicy host init" made and "secpolicy host assemble" filled;
+// the policy's path is one inside the host.
 #pragma once
 
 #include <functional>
@@ -18,6 +21,7 @@ namespace StandIn {
 
 class Session;
 
+// What a process may ask for besides when it enters a host.
 struct EnterOptions {
   // Directories outside the host that are to be found inside under the same absolute paths: a
   // policy directory that lies outside, for one.
@@ -26,10 +30,14 @@ struct EnterOptions {
   std::function<void(const std::string& line)> trace = nullptr;
   // Operations that the kernel is to refuse: "OPERATION", or "OPERATION:N" for its N-th call.
   std::vector<std::string> faults = {};
-  // Which kernel the process has: the host's own; one that holds what the host's does at this
-  // moment; or one that has just been started. The last two are the process's own and are forgotten
-  // with it: what is loaded into them changes nothing on disk.
-  enum class Kernel { kKept, kSnapshot, kScratch } kernel = Kernel::kKept;
+  // Which kernel the process has. All but kKept are the process's own and are forgotten with it:
+  // what is loaded into them changes nothing on disk.
+  enum class Kernel {
+    kKept,      // the host's own
+    kSnapshot,  // one that holds what the host's does at this moment
+    kScratch,   // one that has just been started
+  };
+  Kernel kernel = Kernel::kKept;  // the process's
 };
 
 // This process's use of a host. Entering changes the process for good: its root directory is the
