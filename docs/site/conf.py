@@ -35,6 +35,8 @@ html_theme_options = {"navigation_with_keys": True}
 html_static_path = [str(pathlib.Path(__file__).parent / "static")]
 html_css_files = ["site.css"]
 html_copy_source = False
+# Pages that are opened as files may not fetch each other.
+html_show_search_summary = False
 html_show_sourcelink = False
 html_show_sphinx = False
 html_show_copyright = False

@@ -32,6 +32,20 @@ def leave_out_private(xml):
         tree.write(file, encoding="utf-8", xml_declaration=True)
 
 
+def leave_out_second_names(file):
+    """From a header of C: a type that is defined under the name of its tag is shown once."""
+    tree = ElementTree.parse(file)
+    header = tree.getroot().find("compounddef")
+    tags = {inner.text for inner in header.findall("innerclass")}
+    tags |= {member.findtext("name") for member in header.iter("memberdef")
+             if member.get("kind") == "enum"}
+    for section in header.findall("sectiondef"):
+        for member in section.findall("memberdef"):
+            if member.get("kind") == "typedef" and member.findtext("name") in tags:
+                section.remove(member)
+    tree.write(file, encoding="utf-8", xml_declaration=True)
+
+
 def described(repository, out):
     """Has Doxygen read the headers; its XML, in `out`. Throws SiteError for what it complains of."""
     settings = (repository / "docs/site/Doxyfile").read_text()
@@ -90,19 +104,27 @@ class Namespace:
         return bool(self.parts) and not self.name.endswith("::Internal")
 
 
+def top_of(header):
+    """The comment that a header begins with, as text."""
+    text = header.read_text()
+    if text.startswith("/*"):
+        return re.sub(r"^ \*? ?", "", text[2:text.index("*/")], flags=re.MULTILINE).strip()
+    lines = itertools.takewhile(lambda line: line.startswith("//"), text.splitlines())
+    return "\n".join(re.sub("^// ?", "", line) for line in lines)
+
+
 def headers(repository):
     """All headers in their order: what one writes to include them, and the text at their top."""
     for folder in FOLDERS:
         for path in sorted((repository / folder).glob("*.h")):
-            top = itertools.takewhile(lambda line: line.startswith("//"),
-                                      path.read_text().splitlines())
-            text = "\n".join(re.sub("^// ?", "", line) for line in top)
-            yield str(path.relative_to(repository / folder.split("/")[0])), text
+            yield str(path.relative_to(repository / folder.split("/")[0])), top_of(path)
 
 
 def stage(repository, xml, source):
     """Writes a page for each namespace and each header without one, and one that lists them."""
     leave_out_private(xml)
+    for file in xml.glob("*_8h.xml"):
+        leave_out_second_names(file)
     namespaces = [Namespace(file, xml) for file in sorted(xml.glob("namespace*.xml"))
                   if not file.name.endswith("_8dox.xml")]
     texts = {}
@@ -111,7 +133,7 @@ def stage(repository, xml, source):
         for one in shown:
             texts.setdefault(one.name, [[], one.parts])[0].append(f"`<{header}>`: {text}\n")
         if not shown:
-            texts[header] = [[f"{text}\n"], [directive("file", header)]]
+            texts[header] = [[], [directive("file", header)]]
     (source / "reference").mkdir()
     index = [(repository / "docs/site/reference.md").read_text(), ""]
     names = []

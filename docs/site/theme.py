@@ -28,7 +28,7 @@ def with_dark_colours(text):
         return text
     rules = "\n".join(f'body:not([data-theme="light"]){found[1]}{{{found[2]}}}'
                       for found in DARK.finditer(text) if "theme-toggle" not in found[1])
-    return f"{text}\n@media not print and (prefers-color-scheme: dark) {{\n{rules}\n}}\n"
+    return f"{text}\n@media screen and (prefers-color-scheme: dark) {{\n{rules}\n}}\n"
 
 
 def make_whole(static):
