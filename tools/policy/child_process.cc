@@ -7,7 +7,6 @@
 
 #include <array>
 #include <cerrno>
-#include <cstdlib>
 #include <exception>
 #include <string_view>
 #include <system_error>
@@ -26,6 +25,7 @@ namespace {
   throw std::system_error(errno, std::generic_category(), call);
 }
 
+// What the parent registered for its own end, and what its streams still hold, stays the parent's.
 [[noreturn]] void BeChild(const std::function<int()>& work, UniqueFd errors) {
   int status = kFailed;
   try {
@@ -37,7 +37,7 @@ namespace {
     ReportError(failure.what());
     status = kFailed;
   }
-  std::exit(status);
+  _exit(status);
 }
 
 // Hands over the complete lines of `text` and leaves the rest in it.

@@ -1,18 +1,16 @@
 #include "tools/policy/host_work.h"
 
-#include <sys/mman.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstring>
 #include <exception>
 #include <stdexcept>
-#include <system_error>
 
-#include "host/image/file_io.h"
 #include "tools/policy/child_process.h"
 #include "tools/policy/error_messages.h"
 #include "tools/policy/exit_status.h"
+#include "tools/policy/letter.h"
 #include "tools/policy/progress.h"
 
 namespace SecPolicyTool {
@@ -21,34 +19,6 @@ namespace {
 
 using nlohmann::json;
 using StandIn::Session;
-using StandIn::UniqueFd;
-
-// A file without a name, in which the child leaves what it found. CBOR, since its strings may hold
-// any bytes.
-class Letter {
- public:
-  Letter() : fd_(memfd_create("secpolicy", MFD_CLOEXEC)) {
-    if (fd_.Get() < 0) throw std::system_error(errno, std::generic_category(), "memfd_create");
-  }
-
-  void Write(const json& content) const {
-    const std::vector<std::uint8_t> bytes = json::to_cbor(content);
-    for (std::size_t done = 0; done < bytes.size();) {
-      const ssize_t size = write(fd_.Get(), &bytes[done], bytes.size() - done);
-      if (size < 0) throw std::system_error(errno, std::generic_category(), "write");
-      done += static_cast<std::size_t>(size);
-    }
-  }
-
-  [[nodiscard]] json Read() const {
-    if (lseek(fd_.Get(), 0, SEEK_SET) != 0) return nullptr;
-    const std::string bytes = StandIn::ReadAll(fd_.Get(), "result");
-    return bytes.empty() ? json() : json::from_cbor(bytes);
-  }
-
- private:
-  UniqueFd fd_;
-};
 
 // What the terminate handler needs, which is not handed anything.
 struct Current {
