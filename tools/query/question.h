@@ -3,11 +3,11 @@
 
 #include <cstdint>
 #include <functional>
-#include <stdexcept>
 #include <string>
 #include <vector>
 
 #include "tools/policy/policy.h"
+#include "tools/query/bad_request.h"
 #include "tools/query/vocabulary.h"
 
 namespace SecPolicyTool {
@@ -20,7 +20,7 @@ struct Question {
 };
 
 // What is wrong with a question.
-class BadQuestion : public std::runtime_error {
+class BadQuestion : public BadRequest {
  public:
   enum class Kind : std::uint8_t {
     kForm,  // the number of its words
@@ -28,7 +28,7 @@ class BadQuestion : public std::runtime_error {
   };
 
   BadQuestion(Kind kind, std::size_t word, const std::string& text)
-      : std::runtime_error(text), kind_(kind), word_(word) {}
+      : BadRequest(text), kind_(kind), word_(word) {}
 
   [[nodiscard]] Kind Of() const { return kind_; }
   // The word that is wrong, from 0.

@@ -4,6 +4,7 @@
 
 #include "host/module/description_json.h"
 #include "tools/policy/unknown_word.h"
+#include "tools/query/bad_request.h"
 
 namespace SecPolicyTool {
 
@@ -32,7 +33,7 @@ Vocabulary VocabularyOf(const StandIn::HostDirectory& host, const Policy& policy
 const DomainContent& DomainOf(const Policy& policy, const std::string& name) {
   const auto domain = policy.domains.find(name);
   if (domain != policy.domains.end()) return domain->second;
-  throw std::runtime_error(UnknownWordText("domain", name, NamesOf(policy.domains)));
+  throw BadRequest(UnknownWordText("domain", name, NamesOf(policy.domains)));
 }
 
 }  // namespace SecPolicyTool

@@ -20,7 +20,7 @@ struct Vocabulary {
 // host's description is damaged.
 Vocabulary VocabularyOf(const StandIn::HostDirectory& host, const Policy& policy);
 
-// The domain of that name. Throws std::runtime_error `unknown domain "NAME"`, as UnknownWordText.
+// The domain of that name. Throws BadRequest `unknown domain "NAME"`, as UnknownWordText.
 const DomainContent& DomainOf(const Policy& policy, const std::string& name);
 
 }  // namespace SecPolicyTool

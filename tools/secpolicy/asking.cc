@@ -1,5 +1,7 @@
 #include "tools/secpolicy/asking.h"
 
+#include <utility>
+
 #include "tools/secpolicy/host_option.h"
 
 namespace SecPolicyTool {
@@ -16,16 +18,9 @@ void AddQuestion(CLI::App& verb, std::vector<std::string>& words) {
       ->required();
 }
 
-Question AskedPolicy::Parse(const std::vector<std::string>& words) const {
-  return ParseQuestion(words, vocabulary,
-                       [this](const std::string& path) { return paths.Resolve(path); });
-}
-
 AskedPolicy ReadAsked(const AskingArguments& arguments, OnErrors onErrors) {
   Policy policy = ReadPolicy(arguments.host, arguments.policy, onErrors);
-  const StandIn::HostDirectory host = OpenHost(arguments.host);
-  Vocabulary vocabulary = VocabularyOf(host, policy);
-  return {std::move(policy), std::move(vocabulary), HostPaths(host)};
+  return {std::move(policy), OpenHost(arguments.host)};
 }
 
 AskedPolicy ReadAskedFor(const std::vector<std::string>& words, const AskingArguments& arguments) {
@@ -35,16 +30,6 @@ AskedPolicy ReadAskedFor(const std::vector<std::string>& words, const AskingArgu
     throw CLI::ValidationError("OPERATION", problem.what());
   }
   return ReadAsked(arguments, OnErrors::kWarn);
-}
-
-nlohmann::json AskedJson(const AskingArguments& arguments, const std::vector<std::string>& words,
-                         const Question& question) {
-  nlohmann::json entry{{"policy", arguments.policy},
-                       {"operation", words.front()},
-                       {"objects", std::vector<std::string>(words.begin() + 1, words.end())},
-                       {"type", InfoOf(question.key.type).keyword}};
-  if (question.key.type == RuleType::kPath) entry["path"] = question.key.words[0];
-  return entry;
 }
 
 }  // namespace SecPolicyTool

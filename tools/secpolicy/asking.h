@@ -2,13 +2,10 @@
 #pragma once
 
 #include <CLI/CLI.hpp>
-#include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
-#include "tools/query/host_paths.h"
-#include "tools/query/question.h"
-#include "tools/query/vocabulary.h"
+#include "tools/requests/questions.h"
 #include "tools/secpolicy/source_option.h"
 
 namespace SecPolicyTool {
@@ -25,25 +22,11 @@ void AddAskingOptions(CLI::App& verb, AskingArguments& arguments);
 // Adds the positional arguments of a question, to be read in the verb's callback.
 void AddQuestion(CLI::App& verb, std::vector<std::string>& words);
 
-// The policy that is asked, and what its questions may speak of.
-struct AskedPolicy {
-  Policy policy;
-  Vocabulary vocabulary;
-  HostPaths paths;
-
-  // Throws BadQuestion.
-  [[nodiscard]] Question Parse(const std::vector<std::string>& words) const;
-};
-
-// Throws as ReadPolicy does.
+// The policy that is asked. Throws as ReadPolicy does.
 AskedPolicy ReadAsked(const AskingArguments& arguments, OnErrors onErrors);
 
 // The same for a question, whose form is checked first. Throws CLI::ValidationError when that is
 // wrong.
 AskedPolicy ReadAskedFor(const std::vector<std::string>& words, const AskingArguments& arguments);
-
-// The members of --json that say what was asked.
-nlohmann::json AskedJson(const AskingArguments& arguments, const std::vector<std::string>& words,
-                         const Question& question);
 
 }  // namespace SecPolicyTool

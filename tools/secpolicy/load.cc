@@ -9,12 +9,12 @@
 #include <stdexcept>
 
 #include "host/image/session.h"
-#include "secpolicy/secpolicy.h"
 #include "tools/policy/child_process.h"
 #include "tools/policy/output.h"
 #include "tools/policy/policy_path.h"
 #include "tools/policy/progress.h"
 #include "tools/policy/progress_filter.h"
+#include "tools/requests/batch_load.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
 
@@ -64,19 +64,12 @@ int LoadIn(StandIn::HostDirectory host, const LoadArguments& arguments) {
   OpenProgressLog();
   const std::string stateFile = host.Ref().PathOf(StandIn::kStateFile);
   StandIn::Session session(std::move(host), OptionsOf(arguments, policy));
-  session.BeginBatch();
   const Loading current{session, stateFile};
   loading = &current;
   std::set_terminate(OnTerminate);
-  int status = kDone;
-  try {
-    SecPolicy::LoadPolicy(policy.path);
-  } catch (const std::exception& failure) {
-    ReportError(failure.what());
-    status = kFailed;
-  }
+  const LoadEnd end = LoadInBatch(session, policy.path);
   session.Commit();
-  return status;
+  return end == LoadEnd::kDone ? kDone : kFailed;
 }
 
 // The load may have been over but for its exit, or another process may have written.

@@ -6,8 +6,6 @@
 
 #include "tools/policy/output.h"
 #include "tools/policy/terminal.h"
-#include "tools/query/decision.h"
-#include "tools/query/rule_json.h"
 #include "tools/secpolicy/asking.h"
 #include "tools/secpolicy/verbs.h"
 
@@ -27,11 +25,8 @@ ExitStatus PrintAnswer(const MayArguments& arguments) {
   const Question question = asked.Parse(arguments.words);
   const Answer answer = DomainDecisions(domain).Decide(question);
   if (arguments.asking.isJson) {
-    nlohmann::json content = AskedJson(arguments.asking, arguments.words, question);
-    content["domain"] = arguments.domain;
-    content["allowed"] = answer.isAllowed;
-    content["rule"] = RuleJson(answer.rule);
-    PrintJson(content);
+    PrintJson(
+        MayJson({arguments.asking.policy, arguments.words}, arguments.domain, question, answer));
   } else {
     const Painter painter(WantsColour(STDOUT_FILENO));
     std::cout << painter.Paint(answer.isAllowed ? Colour::kGreen : Colour::kRed, AnswerText(answer))

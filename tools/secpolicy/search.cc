@@ -1,16 +1,10 @@
 // secpolicy search [--host DIR] [--json] SOURCE [terms]
-#include "tools/query/search.h"
-
 #include <iostream>
 #include <memory>
-#include <regex>
 
 #include "tools/policy/output.h"
-#include "tools/policy/terminal.h"
-#include "tools/query/host_paths.h"
-#include "tools/query/paths.h"
-#include "tools/query/rule_json.h"
-#include "tools/query/vocabulary.h"
+#include "tools/query/bad_request.h"
+#include "tools/requests/search_request.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/source_option.h"
 #include "tools/secpolicy/verbs.h"
@@ -26,66 +20,35 @@ struct SearchArguments {
   bool isRegex = false;
   bool isGranted = false;
   bool isRevoked = false;
-  std::optional<std::string> domain;
-  std::optional<std::string> type;
-  std::optional<std::string> word;
-  std::optional<std::string> path;
+  SearchRequest request;
 };
 
-std::regex RegexOf(const std::string& text) try {
-  return std::regex(text, std::regex::ECMAScript);
-} catch (const std::regex_error& problem) {
-  throw CLI::ValidationError(
-      "--word", "\"" + Printable(text) + "\" is no regular expression: " + problem.what());
+SearchRequest RequestOf(const SearchArguments& arguments) {
+  SearchRequest request = arguments.request;
+  if (arguments.isRegex) request.wordIs = SearchRequest::Word::kRegex;
+  if (arguments.isGranted || arguments.isRevoked) request.isGranted = arguments.isGranted;
+  return request;
 }
 
-SearchTerms TermsOf(const SearchArguments& arguments) {
-  SearchTerms terms;
-  terms.domain = arguments.domain;
-  if (arguments.type) terms.type = TypeNamed(*arguments.type);
-  terms.path = arguments.path;
-  if (arguments.isGranted || arguments.isRevoked) terms.isGranted = arguments.isGranted;
-  if (arguments.word && arguments.isRegex) {
-    terms.word = [regex = RegexOf(*arguments.word)](const std::string& word) {
-      return std::regex_search(word, regex);
-    };
-  } else if (arguments.word) {
-    terms.word = [wanted = *arguments.word](const std::string& word) { return word == wanted; };
-  }
-  return terms;
-}
-
-nlohmann::json FoundJson(const std::vector<FoundRule>& found) {
-  nlohmann::json entries = nlohmann::json::array();
-  for (const FoundRule& each : found) {
-    entries.push_back({{"domain", *each.domain}, {"rule", RuleJson(*each.rule)}});
-  }
-  return entries;
+// A pattern that is none is wrong usage, and told before a policy is read.
+void RequireTerms(const SearchRequest& request, const HostPaths& paths) try {
+  TermsOf(request, paths);
+} catch (const BadRequest& problem) {
+  throw CLI::ValidationError("--word", problem.what());
 }
 
 ExitStatus PrintFound(const SearchArguments& arguments) {
-  SearchTerms terms = TermsOf(arguments);
+  const SearchRequest request = RequestOf(arguments);
+  const HostPaths paths(OpenHost(arguments.host));
+  RequireTerms(request, paths);
   const Policy policy = ReadPolicy(arguments.host, arguments.source, OnErrors::kWarn);
-  if (terms.domain) DomainOf(policy, *terms.domain);
-  if (terms.path) {
-    terms.path = NormalPath(HostPaths(OpenHost(arguments.host)).Resolve(*terms.path));
-  }
-  const std::vector<FoundRule> found = Search(policy, terms);
+  const std::vector<FoundRule> found = Find(policy, request, paths);
   if (arguments.isJson) {
-    PrintJson({{"source", arguments.source}, {"matches", FoundJson(found)}});
+    PrintJson(SearchJson(arguments.source, found));
   } else {
     for (const FoundRule& each : found) std::cout << FoundText(each) << "\n";
   }
   return found.empty() ? kFailed : kDone;
-}
-
-// For CLI11: what is wrong with the value of an option, or nothing.
-std::string TypeProblem(const std::string& name) {
-  return TypeNamed(name) ? "" : "no type of rules is called \"" + Printable(name) + "\"";
-}
-
-std::string PathProblem(const std::string& path) {
-  return path.starts_with('/') ? "" : "not an absolute path: \"" + Printable(path) + "\"";
 }
 
 }  // namespace
@@ -97,15 +60,16 @@ void AddSearch(CLI::App& app, ExitStatus& status) {
   AddHostOption(*verb, arguments->host);
   AddJsonOption(*verb, arguments->isJson);
   AddSourceOption(*verb, arguments->source);
-  verb->add_option("--domain", arguments->domain, "Rules of this domain")->type_name("NAME");
-  verb->add_option("--type", arguments->type, "Rules of this type, such as -s or syscall")
+  verb->add_option("--domain", arguments->request.domain, "Rules of this domain")
+      ->type_name("NAME");
+  verb->add_option("--type", arguments->request.type, "Rules of this type, such as -s or syscall")
       ->type_name("TYPE")
       ->check(TypeProblem);
-  CLI::Option* word =
-      verb->add_option("--word", arguments->word, "Rules with this word")->type_name("WORD");
+  CLI::Option* word = verb->add_option("--word", arguments->request.word, "Rules with this word")
+                          ->type_name("WORD");
   verb->add_flag("--regex", arguments->isRegex, "The word is a regular expression (ECMAScript)")
       ->needs(word);
-  verb->add_option("--path", arguments->path,
+  verb->add_option("--path", arguments->request.path,
                    "Path rules that decide on this path, or are for something below it")
       ->type_name("PATH")
       ->check(PathProblem);

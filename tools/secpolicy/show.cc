@@ -4,18 +4,14 @@
 #include <stdexcept>
 
 #include "secpolicy/secpolicy.h"
-#include "tools/kernel/tables.h"
 #include "tools/policy/held_policy.h"
 #include "tools/policy/output.h"
-#include "tools/query/rule_json.h"
+#include "tools/requests/held_json.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/host_use.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
-
-using nlohmann::json;
-using SecPolicy::ZekAccessInterfaceImpl;
 
 namespace {
 
@@ -32,56 +28,15 @@ void RequireDomain(StandIn::SecurityModule& module, unsigned int domain) {
   }
 }
 
-json DomainsJson(const Policy& policy, const std::optional<unsigned int>& domain,
-                 ZekAccessInterfaceImpl& iface) {
-  json domains = json::array();
-  for (const DomainRow& row : ReadDomains(iface)) {
-    if (domain && row.id != *domain) continue;
-    json entry = ToJson(row);
-    entry["rules"] = json::array();
-    for (const PolicyRule& rule : policy.domains.at(row.name).rules) {
-      entry["rules"].push_back(RuleJson(rule));
-    }
-    domains.push_back(std::move(entry));
-  }
-  return domains;
-}
-
-json ObjectsJson(ZekAccessInterfaceImpl& iface) {
-  json objects = json::array();
-  for (const auto& [name, id] : iface.GetKeywordsMap(ZekCtl::Security::kObjectKeyword)) {
-    objects.push_back({{"name", name}, {"id", id}});
-  }
-  return objects;
-}
-
-json TardisksJson(const Policy& policy, const StandIn::ImageIndex& image) {
-  json tardisks = json::array();
-  for (const StandIn::TardiskContent& tardisk : image.tardisks) {
-    const auto labelled = policy.tardisks.find(tardisk.name);
-    tardisks.push_back(
-        {{"path", std::string(StandIn::kArchivesPath) + "/" + tardisk.name},
-         {"label", labelled == policy.tardisks.end() ? kUnlabelled : labelled->second.label}});
-  }
-  return tardisks;
-}
-
-void PrintPolicy(const ShowArguments& arguments, const StandIn::ImageIndex& image,
-                 StandIn::SecurityModule& module) {
-  const Policy policy = HeldPolicy(module, image);
-  ZekAccessInterfaceImpl iface;
-  PrintJson({{"domains", DomainsJson(policy, arguments.domain, iface)},
-             {"objects", ObjectsJson(iface)},
-             {"tardisks", TardisksJson(policy, image)}});
-}
-
 void Show(const ShowArguments& arguments) {
   const StandIn::ImageIndex image = ImageOf(OpenHost(arguments.host));
   StandIn::SessionOptions options;
   options.kernel = StandIn::SessionOptions::Kernel::kSnapshot;
   const auto session = EnterHost(arguments.host, options);
   if (arguments.domain) RequireDomain(session->Module(), *arguments.domain);
-  if (arguments.isJson) return PrintPolicy(arguments, image, session->Module());
+  if (arguments.isJson) {
+    return PrintJson(HeldJson(session->Module(), image, arguments.domain));
+  }
   SecPolicy::DisplayPolicy(arguments.domain ? std::to_string(*arguments.domain) : "");
 }
 

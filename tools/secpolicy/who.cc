@@ -4,8 +4,6 @@
 
 #include "tools/policy/output.h"
 #include "tools/policy/terminal.h"
-#include "tools/query/decision.h"
-#include "tools/query/rule_json.h"
 #include "tools/secpolicy/asking.h"
 #include "tools/secpolicy/verbs.h"
 
@@ -18,31 +16,12 @@ struct WhoArguments {
   std::vector<std::string> words;
 };
 
-struct AllowedDomain {
-  std::string name;
-  const PolicyRule* rule;
-};
-
-std::vector<AllowedDomain> AllowedBy(const Policy& policy, const Question& question) {
-  std::vector<AllowedDomain> allowed;
-  for (const auto& [name, domain] : policy.domains) {
-    const Answer answer = DomainDecisions(domain).Decide(question);
-    if (answer.isAllowed) allowed.push_back({name, answer.rule});
-  }
-  return allowed;
-}
-
 ExitStatus PrintAllowed(const WhoArguments& arguments) {
   const AskedPolicy asked = ReadAskedFor(arguments.words, arguments.asking);
   const Question question = asked.Parse(arguments.words);
   const std::vector<AllowedDomain> allowed = AllowedBy(asked.policy, question);
   if (arguments.asking.isJson) {
-    nlohmann::json content = AskedJson(arguments.asking, arguments.words, question);
-    content["domains"] = nlohmann::json::array();
-    for (const AllowedDomain& each : allowed) {
-      content["domains"].push_back({{"domain", each.name}, {"rule", RuleJson(each.rule)}});
-    }
-    PrintJson(content);
+    PrintJson(WhoJson({arguments.asking.policy, arguments.words}, question, allowed));
   } else {
     for (const AllowedDomain& each : allowed) {
       std::cout << Printable(each.name) << ": " << RuleText(*each.rule) << "\n";

@@ -1,0 +1,74 @@
+#include "tools/requests/search_request.h"
+
+#include <regex>
+
+#include "tools/policy/terminal.h"
+#include "tools/query/bad_request.h"
+#include "tools/query/paths.h"
+#include "tools/query/rule_json.h"
+#include "tools/query/vocabulary.h"
+
+namespace SecPolicyTool {
+
+using nlohmann::json;
+
+namespace {
+
+std::regex RegexOf(const std::string& text) try {
+  return std::regex(text, std::regex::ECMAScript);
+} catch (const std::regex_error& problem) {
+  throw BadRequest("\"" + Printable(text) + "\" is no regular expression: " + problem.what());
+}
+
+std::function<bool(const std::string&)> WordTerm(const SearchRequest& request) {
+  if (!request.word) return {};
+  if (request.wordIs == SearchRequest::Word::kExact) {
+    return [wanted = *request.word](const std::string& word) { return word == wanted; };
+  }
+  return [regex = RegexOf(*request.word)](const std::string& word) {
+    return std::regex_search(word, regex);
+  };
+}
+
+void Require(const std::string& problem) {
+  if (!problem.empty()) throw BadRequest(problem);
+}
+
+}  // namespace
+
+std::string TypeProblem(const std::string& name) {
+  return TypeNamed(name) ? "" : "no type of rules is called \"" + Printable(name) + "\"";
+}
+
+std::string PathProblem(const std::string& path) {
+  return path.starts_with('/') ? "" : "not an absolute path: \"" + Printable(path) + "\"";
+}
+
+SearchTerms TermsOf(const SearchRequest& request, const HostPaths& paths) {
+  if (request.type) Require(TypeProblem(*request.type));
+  if (request.path) Require(PathProblem(*request.path));
+  SearchTerms terms;
+  terms.domain = request.domain;
+  if (request.type) terms.type = TypeNamed(*request.type);
+  terms.word = WordTerm(request);
+  if (request.path) terms.path = NormalPath(paths.Resolve(*request.path));
+  terms.isGranted = request.isGranted;
+  return terms;
+}
+
+std::vector<FoundRule> Find(const Policy& policy, const SearchRequest& request,
+                            const HostPaths& paths) {
+  const SearchTerms terms = TermsOf(request, paths);
+  if (terms.domain) DomainOf(policy, *terms.domain);
+  return Search(policy, terms);
+}
+
+json SearchJson(const std::string& source, const std::vector<FoundRule>& found) {
+  json matches = json::array();
+  for (const FoundRule& each : found) {
+    matches.push_back({{"domain", *each.domain}, {"rule", RuleJson(*each.rule)}});
+  }
+  return {{"source", source}, {"matches", std::move(matches)}};
+}
+
+}  // namespace SecPolicyTool
