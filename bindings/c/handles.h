@@ -1,0 +1,22 @@
+// What the handles of the C interface hold.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "secpolicy/secpolicy_c.h"
+
+struct secpolicy_text {
+  std::string value;
+};
+
+struct secpolicy_host {
+  std::string path;  // absolute
+};
+
+struct secpolicy_policy {
+  std::string host;     // the path of its host
+  std::string source;   // as given; empty for the host's own directory
+  std::string content;  // CBOR of what ToJson makes of a policy
+  std::vector<std::string> errors;
+};

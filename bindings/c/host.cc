@@ -1,0 +1,64 @@
+// Host directories.
+#include <filesystem>
+#include <memory>
+
+#include "bindings/c/arguments.h"
+#include "bindings/c/barrier.h"
+#include "bindings/c/child.h"
+#include "bindings/c/handles.h"
+#include "host/image/assemble.h"
+#include "host/image/host_directory.h"
+#include "host/module/description_json.h"
+
+using SecPolicyC::Fields;
+using SecPolicyC::Guarded;
+using SecPolicyC::InChild;
+using SecPolicyC::PathOf;
+using SecPolicyC::RequireSet;
+using StandIn::HostDirectory;
+
+extern "C" {
+
+secpolicy_status secpolicy_host_create(const char* directory, secpolicy_error** error) {
+  return Guarded(error, [&] {
+    const std::string path = PathOf(directory, "directory");
+    InChild([&] {
+      HostDirectory::Create(path, StandIn::DefaultDescriptionText());
+      return Fields{};
+    });
+  });
+}
+
+secpolicy_status secpolicy_host_open(const char* directory, secpolicy_host** host,
+                                     secpolicy_error** error) {
+  if (host != nullptr) *host = nullptr;
+  return Guarded(error, [&] {
+    RequireSet(host, "host");
+    const std::string path = PathOf(directory, "directory");
+    auto opened = std::make_unique<secpolicy_host>();
+    opened->path = std::filesystem::absolute(path).string();
+    InChild([&] {
+      const HostDirectory here(path);
+      return Fields{};
+    });
+    *host = opened.release();
+  });
+}
+
+secpolicy_status secpolicy_host_assemble(const secpolicy_host* host, secpolicy_error** error) {
+  return Guarded(error, [&] {
+    RequireSet(host, "host");
+    InChild([&] {
+      StandIn::Assemble(HostDirectory(host->path));
+      return Fields{};
+    });
+  });
+}
+
+const char* secpolicy_host_path(const secpolicy_host* host) {
+  return host == nullptr ? nullptr : host->path.c_str();
+}
+
+void secpolicy_host_free(secpolicy_host* host) { delete host; }
+
+}  // extern "C"

@@ -1,0 +1,163 @@
+// Policies as they were read, and questions to them.
+#include <memory>
+#include <utility>
+
+#include "bindings/c/text.h"
+#include "tools/policy/policy_json.h"
+#include "tools/policy/policy_source.h"
+#include "tools/policy/utf8_text.h"
+#include "tools/requests/questions.h"
+#include "tools/requests/search_request.h"
+
+using nlohmann::json;
+using SecPolicyC::AnswerWithText;
+using SecPolicyC::Failure;
+using SecPolicyC::Fields;
+using SecPolicyC::OptionalTextOf;
+using SecPolicyC::RequireSet;
+using SecPolicyC::TextOf;
+using SecPolicyC::WordsOf;
+using SecPolicyTool::AskedPolicy;
+using SecPolicyTool::Policy;
+using SecPolicyTool::Question;
+using SecPolicyTool::SearchRequest;
+using StandIn::HostDirectory;
+
+namespace {
+
+// The content first, then the errors.
+Fields ReadPolicy(const std::string& hostPath, const std::string& source) {
+  const SecPolicyTool::SourcePolicy read =
+      SecPolicyTool::ReadSource(HostDirectory(hostPath), source);
+  Fields fields(1);
+  json::to_cbor(SecPolicyTool::ToJson(read.policy), fields[0]);
+  for (const std::string& error : read.errors) fields.push_back(SecPolicyTool::ValidText(error));
+  return fields;
+}
+
+Policy ContentOf(const secpolicy_policy& policy) {
+  return SecPolicyTool::PolicyOfJson(json::from_cbor(policy.content));
+}
+
+std::optional<bool> IsGrantedOf(secpolicy_decision decision) {
+  switch (decision) {
+    case SECPOLICY_ANY_DECISION:
+      return std::nullopt;
+    case SECPOLICY_GRANTED:
+      return true;
+    case SECPOLICY_REVOKED:
+      return false;
+  }
+  throw Failure(SECPOLICY_INVALID_ARGUMENT, "terms->decision is none");
+}
+
+SearchRequest RequestOf(const secpolicy_search_terms* terms) {
+  RequireSet(terms, "terms");
+  if (terms->size != sizeof *terms) {
+    throw Failure(SECPOLICY_INVALID_ARGUMENT, "terms->size is not that of secpolicy_search_terms");
+  }
+  if (terms->word != nullptr && terms->pattern != nullptr) {
+    throw Failure(SECPOLICY_INVALID_ARGUMENT, "terms have both a word and a pattern");
+  }
+  SearchRequest request;
+  request.domain = OptionalTextOf(terms->domain, "terms->domain");
+  request.type = OptionalTextOf(terms->type, "terms->type");
+  request.word = OptionalTextOf(terms->word, "terms->word");
+  request.path = OptionalTextOf(terms->path, "terms->path");
+  request.isGranted = IsGrantedOf(terms->decision);
+  if (terms->pattern != nullptr) {
+    request.word = TextOf(terms->pattern, "terms->pattern");
+    request.wordIs = SearchRequest::Word::kRegex;
+  }
+  return request;
+}
+
+AskedPolicy Asked(const secpolicy_policy& policy) {
+  return {ContentOf(policy), HostDirectory(policy.host)};
+}
+
+json SearchIn(const secpolicy_policy& policy, const SearchRequest& request) {
+  const Policy content = ContentOf(policy);
+  const SecPolicyTool::HostPaths paths{HostDirectory(policy.host)};
+  return SecPolicyTool::SearchJson(policy.source, SecPolicyTool::Find(content, request, paths));
+}
+
+json AskMay(const secpolicy_policy& policy, const std::string& domain,
+            const std::vector<std::string>& words) {
+  SecPolicyTool::CheckForm(words);
+  const AskedPolicy asked = Asked(policy);
+  const SecPolicyTool::DomainDecisions decisions(SecPolicyTool::DomainOf(asked.policy, domain));
+  const Question question = asked.Parse(words);
+  return SecPolicyTool::MayJson({policy.source, words}, domain, question,
+                                decisions.Decide(question));
+}
+
+json AskWho(const secpolicy_policy& policy, const std::vector<std::string>& words) {
+  SecPolicyTool::CheckForm(words);
+  const AskedPolicy asked = Asked(policy);
+  const Question question = asked.Parse(words);
+  return SecPolicyTool::WhoJson({policy.source, words}, question,
+                                SecPolicyTool::AllowedBy(asked.policy, question));
+}
+
+}  // namespace
+
+extern "C" {
+
+secpolicy_status secpolicy_policy_read(const secpolicy_host* host, const char* source,
+                                       secpolicy_policy** policy, secpolicy_error** error) {
+  if (policy != nullptr) *policy = nullptr;
+  return SecPolicyC::Guarded(error, [&] {
+    RequireSet(host, "host");
+    RequireSet(policy, "policy");
+    auto read = std::make_unique<secpolicy_policy>();
+    read->host = host->path;
+    read->source = SecPolicyC::PolicyDirOf(source, "source");
+    Fields fields = SecPolicyC::InChild([&] { return ReadPolicy(read->host, read->source); });
+    read->content = std::move(fields.at(0));
+    fields.erase(fields.begin());
+    read->errors = std::move(fields);
+    *policy = read.release();
+  });
+}
+
+size_t secpolicy_policy_error_count(const secpolicy_policy* policy) {
+  return policy == nullptr ? 0 : policy->errors.size();
+}
+
+const char* secpolicy_policy_error(const secpolicy_policy* policy, size_t index) {
+  if (index >= secpolicy_policy_error_count(policy)) return nullptr;
+  return policy->errors[index].c_str();
+}
+
+void secpolicy_policy_free(secpolicy_policy* policy) { delete policy; }
+
+secpolicy_status secpolicy_search(const secpolicy_policy* policy,
+                                  const secpolicy_search_terms* terms, secpolicy_text** result,
+                                  secpolicy_error** error) {
+  return AnswerWithText(result, error, [&] {
+    RequireSet(policy, "policy");
+    return [policy, request = RequestOf(terms)] { return SearchIn(*policy, request); };
+  });
+}
+
+secpolicy_status secpolicy_may(const secpolicy_policy* policy, const char* domain,
+                               const char* const* words, size_t count, secpolicy_text** result,
+                               secpolicy_error** error) {
+  return AnswerWithText(result, error, [&] {
+    RequireSet(policy, "policy");
+    return [policy, name = TextOf(domain, "domain"), asked = WordsOf(words, count)] {
+      return AskMay(*policy, name, asked);
+    };
+  });
+}
+
+secpolicy_status secpolicy_who(const secpolicy_policy* policy, const char* const* words,
+                               size_t count, secpolicy_text** result, secpolicy_error** error) {
+  return AnswerWithText(result, error, [&] {
+    RequireSet(policy, "policy");
+    return [policy, asked = WordsOf(words, count)] { return AskWho(*policy, asked); };
+  });
+}
+
+}  // extern "C"

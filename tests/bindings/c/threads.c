@@ -1,0 +1,196 @@
+/* Calls from several threads, and in the midst of what others do. */
+#define _GNU_SOURCE
+#include <fcntl.h>
+#include <link.h>
+#include <pthread.h>
+#include <stdatomic.h>
+#include <stdlib.h>
+#include <string.h>
+#include <sys/wait.h>
+#include <syslog.h>
+#include <time.h>
+#include <unistd.h>
+
+#include "tests/bindings/c/support.h"
+
+enum { kThreads = 4, kRounds = 3 };
+
+static void* UseOwnHost(void* unused) {
+  struct fixture fixture;
+  secpolicy_error* error = NULL;
+  secpolicy_text* text = NULL;
+  SetUp(&fixture);
+  for (int i = 0; i < kRounds; ++i) {
+    CHECK_DONE(secpolicy_load(fixture.host, PolicyOf(&fixture), NULL, &error), &error);
+    CHECK_DONE(secpolicy_check(fixture.host, PolicyOf(&fixture), &text, &error), &error);
+    CHECK_CONTAINS(secpolicy_text_data(text), "\"errors\": 0");
+    secpolicy_text_free(text);
+  }
+  TearDown(&fixture);
+  return unused;
+}
+
+static void RunThreads(void* (*body)(void*), void* argument) {
+  pthread_t threads[kThreads];
+  for (int i = 0; i < kThreads; ++i) CHECK(pthread_create(&threads[i], NULL, body, argument) == 0);
+  for (int i = 0; i < kThreads; ++i) pthread_join(threads[i], NULL);
+}
+
+static void* UseOneHost(void* fixture) {
+  const struct fixture* const shared = fixture;
+  secpolicy_error* error = NULL;
+  secpolicy_text* text = NULL;
+  for (int i = 0; i < kRounds; ++i) {
+    CHECK_DONE(secpolicy_load(shared->host, PolicyOf(shared), &text, &error), &error);
+    CHECK_CONTAINS(secpolicy_text_data(text), "\"outcome\": \"done\"");
+    secpolicy_text_free(text);
+  }
+  return NULL;
+}
+
+static void HandlesAreShared(void) {
+  struct fixture fixture;
+  SetUp(&fixture);
+  RunThreads(UseOneHost, &fixture);
+  TearDown(&fixture);
+}
+
+/* Threads that are, every other moment, in one of the places whose locks a child would inherit. */
+static atomic_bool isOver;
+
+static bool GoesOn(void) {
+  const struct timespec moment = {.tv_nsec = 50000};
+  nanosleep(&moment, NULL);
+  return !atomic_load(&isOver);
+}
+
+static void* Log(void* unused) {
+  openlog("c_interface_test", LOG_NDELAY, LOG_USER);
+  while (GoesOn()) {
+    for (int i = 0; i < 5; ++i) syslog(LOG_DEBUG, "busy");
+  }
+  closelog();
+  return unused;
+}
+
+static void* TellTime(void* unused) {
+  const time_t now = 0;
+  struct tm parts;
+  while (GoesOn()) {
+    for (int i = 0; i < 100; ++i) localtime_r(&now, &parts);
+  }
+  return unused;
+}
+
+static int LookAtLibrary(struct dl_phdr_info* info, size_t size, void* unused) {
+  (void)info;
+  (void)size;
+  (void)unused;
+  return 0;
+}
+
+static void* LookAtLibraries(void* unused) {
+  while (GoesOn()) {
+    for (int i = 0; i < 50; ++i) dl_iterate_phdr(LookAtLibrary, NULL);
+  }
+  return unused;
+}
+
+static void* Allocate(void* unused) {
+  while (GoesOn()) {
+    for (int i = 0; i < 100; ++i) {
+      void* volatile block = malloc(1000);
+      free(block);
+    }
+  }
+  return unused;
+}
+
+static void LocksOfOthersHoldNobodyUp(void) {
+  void* (*const busy[])(void*) = {Log, TellTime, LookAtLibraries, Allocate};
+  pthread_t threads[4];
+  struct fixture fixture;
+  secpolicy_error* error = NULL;
+  secpolicy_text* text = NULL;
+  SetUp(&fixture);
+  atomic_store(&isOver, false);
+  for (int i = 0; i < 4; ++i) CHECK(pthread_create(&threads[i], NULL, busy[i], NULL) == 0);
+  for (int i = 0; i < 20; ++i) {
+    CHECK_DONE(secpolicy_show(fixture.host, 0, &text, &error), &error);
+    secpolicy_text_free(text);
+  }
+  CHECK_DONE(secpolicy_load(fixture.host, PolicyOf(&fixture), NULL, &error), &error);
+  atomic_store(&isOver, true);
+  for (int i = 0; i < 4; ++i) pthread_join(threads[i], NULL);
+  TearDown(&fixture);
+}
+
+static void* Show(void* host) {
+  secpolicy_error* error = NULL;
+  secpolicy_text* text = NULL;
+  CHECK_DONE(secpolicy_show(host, 0, &text, &error), &error);
+  secpolicy_text_free(text);
+  return NULL;
+}
+
+/* Waits until a thread of this process has a child. */
+static void AwaitChild(void) {
+  const struct timespec moment = {.tv_nsec = 1000000};
+  siginfo_t end;
+  for (int i = 0; i < 30000; ++i) {
+    if (waitid(P_ALL, 0, &end, WEXITED | WNOHANG | WNOWAIT) == 0) return;
+    nanosleep(&moment, NULL);
+  }
+  CHECK(!"there is a child");
+}
+
+/* A child that has to wait for the host must not keep the caller's connections open. */
+static void ConnectionsAreClosedByTheirOwner(void) {
+  struct fixture fixture;
+  struct flock whole = {.l_type = F_WRLCK, .l_whence = SEEK_SET};
+  pthread_t thread;
+  int ends[2];
+  char byte;
+  SetUp(&fixture);
+  const int lock = open(Below(&fixture.directory, "host/kernel.lock"), O_RDWR | O_CREAT, 0666);
+  CHECK(lock >= 0 && fcntl(lock, F_OFD_SETLK, &whole) == 0);
+  CHECK(pipe(ends) == 0);
+  CHECK(pthread_create(&thread, NULL, Show, fixture.host) == 0);
+  AwaitChild();
+  close(ends[1]);
+  CHECK(read(ends[0], &byte, 1) == 0); /* and does not wait for the other thread's call */
+  close(lock);
+  pthread_join(thread, NULL);
+  close(ends[0]);
+  TearDown(&fixture);
+}
+
+static void* ShowUntilCancelled(void* host) {
+  for (int i = 0; i < 10000; ++i) {
+    Show(host);
+    pthread_testcancel();
+  }
+  return NULL;
+}
+
+/* Cancelled in the midst of a call, a thread ends behind it. */
+static void CancellationWaitsForTheCall(void) {
+  struct fixture fixture;
+  pthread_t thread;
+  void* result = NULL;
+  SetUp(&fixture);
+  CHECK(pthread_create(&thread, NULL, ShowUntilCancelled, fixture.host) == 0);
+  AwaitChild();
+  pthread_cancel(thread);
+  pthread_join(thread, &result);
+  CHECK(result == PTHREAD_CANCELED);
+  TearDown(&fixture);
+}
+
+void TestThreads(void) {
+  RunThreads(UseOwnHost, NULL);
+  HandlesAreShared();
+  LocksOfOthersHoldNobodyUp();
+  ConnectionsAreClosedByTheirOwner();
+  CancellationWaitsForTheCall();
+}
