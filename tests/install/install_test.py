@@ -139,6 +139,7 @@ class Files(Installed):
 
     def test_libraries_are_known_by_the_names_that_programs_are_linked_with(self) -> None:
         for name, soname in (("libsecpolicy.so", "libsecpolicy.so.1"),
+                             ("libsecpolicy_c.so", "libsecpolicy_c.so.1"),
                              ("libsecpolicy_host.so", "libsecpolicy_host.so.0")):
             dynamic = self.dynamic(self.prefix / LIBDIR / name)
             self.assertIn(f"Library soname: [{soname}]", dynamic)
