@@ -70,10 +70,8 @@ Fields ToFields(const Failure& failure) {
 }
 
 [[noreturn]] void ThrowFailure(const Fields& fields) {
-  Failure failure(static_cast<secpolicy_status>(std::stoi(fields.at(1))), fields.at(2));
-  failure.file = fields.at(3);
-  failure.line = static_cast<std::uint32_t>(std::stoul(fields.at(4)));
-  throw failure;
+  throw Failure(static_cast<secpolicy_status>(std::stoi(fields.at(1))), fields.at(2), fields.at(3),
+                static_cast<std::uint32_t>(std::stoul(fields.at(4))));
 }
 
 // The child's answer. A failure, lack of memory for the answer included, is one too, if only it

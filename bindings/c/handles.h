@@ -2,11 +2,14 @@
 #pragma once
 
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "secpolicy/secpolicy_c.h"
 
 struct secpolicy_text {
+  explicit secpolicy_text(std::string lines) : value(std::move(lines)) {}
+
   std::string value;
 };
 

@@ -98,10 +98,8 @@ Fields Load(const std::string& hostPath, const std::string& dir) {
 }
 
 Failure LoadFailure(secpolicy_status status, Fields& loaded) {
-  Failure failure(status, std::move(loaded[kMessage]));
-  failure.file = std::move(loaded[kFile]);
-  failure.line = static_cast<std::uint32_t>(std::stoul(loaded[kLine]));
-  return failure;
+  return {status, std::move(loaded[kMessage]), std::move(loaded[kFile]),
+          static_cast<std::uint32_t>(std::stoul(loaded[kLine]))};
 }
 
 }  // namespace
@@ -115,8 +113,8 @@ extern "C" secpolicy_status secpolicy_load(const secpolicy_host* host, const cha
     Fields loaded = SecPolicyC::InChild([&] { return Load(host->path, dir); });
     const auto status = static_cast<secpolicy_status>(std::stoi(loaded.at(kStatus)));
     auto text = std::make_unique<secpolicy_text>(std::move(loaded.at(kText)));
-    const Failure failure = LoadFailure(status, loaded);
+    Failure failure = LoadFailure(status, loaded);
     if (result != nullptr) *result = text.release();
-    if (status != SECPOLICY_OK) throw failure;
+    if (status != SECPOLICY_OK) throw Failure(std::move(failure));
   });
 }
