@@ -47,6 +47,8 @@ std::optional<bool> IsGrantedOf(secpolicy_decision decision) {
       return true;
     case SECPOLICY_REVOKED:
       return false;
+    case SECPOLICY_DECISION_RANGE:
+      break;
   }
   throw Failure(SECPOLICY_INVALID_ARGUMENT, "terms->decision is none");
 }

@@ -76,7 +76,9 @@ typedef enum secpolicy_status {
   /* There is no memory. */
   SECPOLICY_OUT_OF_MEMORY = 6,
   /* The child process could not be made, or came to no end of its own. */
-  SECPOLICY_SYSTEM = 7
+  SECPOLICY_SYSTEM = 7,
+  /* None. Any number may be asked for its name. */
+  SECPOLICY_STATUS_RANGE = INT32_MAX
 } secpolicy_status;
 
 /* The name of a status, "SECPOLICY_OK" for instance; "unknown" for other numbers. Never NULL. */
@@ -186,8 +188,9 @@ void secpolicy_policy_free(secpolicy_policy* policy);
 
 typedef enum secpolicy_decision {
   SECPOLICY_ANY_DECISION = 0,
-  SECPOLICY_GRANTED = 1, /* that grant, or permit something */
-  SECPOLICY_REVOKED = 2  /* that revoke, or permit nothing */
+  SECPOLICY_GRANTED = 1,               /* that grant, or permit something */
+  SECPOLICY_REVOKED = 2,               /* that revoke, or permit nothing */
+  SECPOLICY_DECISION_RANGE = INT32_MAX /* none */
 } secpolicy_decision;
 
 /* What is looked for; all of it has to hold. Zeroed, but for the size, for every rule. */

@@ -31,7 +31,7 @@ static void NamesOfStatuses(void) {
   CHECK_TEXT(secpolicy_status_name(SECPOLICY_OUT_OF_MEMORY), "SECPOLICY_OUT_OF_MEMORY");
   CHECK_TEXT(secpolicy_status_name(SECPOLICY_SYSTEM), "SECPOLICY_SYSTEM");
   CHECK_TEXT(secpolicy_status_name((secpolicy_status)8), "unknown");
-  CHECK_TEXT(secpolicy_status_name((secpolicy_status)-1), "unknown");
+  CHECK_TEXT(secpolicy_status_name(SECPOLICY_STATUS_RANGE), "unknown");
 }
 
 static void VersionIsThatOfTheHeader(void) {
@@ -130,7 +130,7 @@ static void BadTerms(const secpolicy_policy* policy) {
   CHECK_FAILURE(secpolicy_search(policy, &terms, &text, &error), wrong, "both a word and a pattern",
                 &error);
   terms.word = terms.pattern = NULL;
-  terms.decision = (secpolicy_decision)3;
+  terms.decision = (secpolicy_decision)1000;
   CHECK_FAILURE(secpolicy_search(policy, &terms, &text, &error), wrong, "terms->decision", &error);
   CHECK(text == NULL);
 }
