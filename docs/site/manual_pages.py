@@ -31,9 +31,14 @@ def linked(text, names):
     """`text` with a link where it names another page or a document."""
     def link(found):
         name = names.get(f"{found[1]}.{found[2]}")
-        return f'<a href="{name}.html">{found[0]}</a>' if name else found[0]
+        return f'<a href="{place(name)}.html">{found[0]}</a>' if name else found[0]
     text = re.sub(r"<[bi]>([\w:.-]+)</[bi]>\((\d)\)", link, text)
     return re.sub(r"<i>(docs/[\w-]+)\.md</i>", r'<a href="../\1.html">\g<0></a>', text)
+
+
+def place(name):
+    """Where a page lies: a link that begins with a word and a colon leads to another kind of address."""
+    return name.replace("::", ".")
 
 
 def other_name(page):
@@ -68,11 +73,11 @@ def stage(directory, source):
         if names[page.name] != page.name:
             continue
         text, purpose = written(page, names)
-        (source / f"man/{page.name}.md").write_text(text)
+        (source / f"man/{place(page.name)}.md").write_text(text)
         if page.suffix != section:
             section = page.suffix
             index.append(f"\n## {section[1:]}: {TITLES.get(section[1:], 'Others')}\n")
-        index.append(f"- [{page.stem}({page.suffix[1:]})]({page.name}.md): {purpose}")
+        index.append(f"- [{page.stem}({page.suffix[1:]})]({place(page.name)}.md): {purpose}")
     index.append("\n```{toctree}\n:hidden:\n")
-    index += [name for name in names if names[name] == name]
+    index += [place(name) for name in names if names[name] == name]
     (source / "man/index.md").write_text("\n".join([*index, "```\n"]))
