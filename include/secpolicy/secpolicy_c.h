@@ -49,9 +49,10 @@ extern "C" {
 
 /* ---- Version ---- */
 
-/* Of this header. A library of the same major number, and the same or a later minor one, has all
- * that is declared here. */
+/* The major number of this header. A library of the same one, and the same or a later minor one,
+ * has all that is declared here. */
 #define SECPOLICY_C_VERSION_MAJOR 1
+/* The minor number of this header. */
 #define SECPOLICY_C_VERSION_MINOR 0
 
 /* Of the library that runs: the major number times 65,536, plus the minor one. */
@@ -59,7 +60,9 @@ uint32_t secpolicy_c_version(void);
 
 /* ---- Status and errors ---- */
 
+/* What a call came to. */
 typedef enum secpolicy_status {
+  /* All was done. */
   SECPOLICY_OK = 0,
   /* The call is wrong: a NULL that is none of those allowed, a string that is not UTF-8. */
   SECPOLICY_INVALID_ARGUMENT = 1,
@@ -95,6 +98,7 @@ const char* secpolicy_error_message(const secpolicy_error* error);
 const char* secpolicy_error_file(const secpolicy_error* error);
 /* The line there, from 1; 0 when there is none, or for NULL. */
 uint32_t secpolicy_error_line(const secpolicy_error* error);
+/* Ends the description; nothing for NULL. */
 void secpolicy_error_free(secpolicy_error* error);
 
 /* ---- Texts ---- */
@@ -106,6 +110,7 @@ typedef struct secpolicy_text secpolicy_text;
 const char* secpolicy_text_data(const secpolicy_text* text);
 /* Its bytes, without that NUL. 0 for NULL. */
 size_t secpolicy_text_size(const secpolicy_text* text);
+/* Ends the text; nothing for NULL. */
 void secpolicy_text_free(secpolicy_text* text);
 
 /* ---- Hosts ---- */
@@ -184,10 +189,12 @@ size_t secpolicy_policy_error_count(const secpolicy_policy* policy);
 /* One of them, from 0, as the load words it. NULL from the count on, or for NULL. */
 const char* secpolicy_policy_error(const secpolicy_policy* policy, size_t index);
 
+/* Ends the use of the policy; nothing for NULL. */
 void secpolicy_policy_free(secpolicy_policy* policy);
 
+/* Which rules are looked for, by what they decide. */
 typedef enum secpolicy_decision {
-  SECPOLICY_ANY_DECISION = 0,
+  SECPOLICY_ANY_DECISION = 0,          /* all */
   SECPOLICY_GRANTED = 1,               /* that grant, or permit something */
   SECPOLICY_REVOKED = 2,               /* that revoke, or permit nothing */
   SECPOLICY_DECISION_RANGE = INT32_MAX /* none */
