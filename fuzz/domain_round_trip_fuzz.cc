@@ -59,8 +59,8 @@ class Kernel {
     for (std::size_t kind = 0; kind < StandIn::kRuleKinds; ++kind) {
       for (const StandIn::Rule& rule :
            host_.Module().Rules(static_cast<RuleKind>(kind), Fuzz::kAppDomain)) {
-        text += std::to_string(kind) + Fuzz::Joined(rule.words, "|") + ">" +
-                std::to_string(rule.targetDomain) +
+        text += std::to_string(kind) + Fuzz::Joined({rule.words.begin(), rule.words.end()}, "|") +
+                ">" + std::to_string(rule.targetDomain) +
                 (rule.decision == StandIn::Decision::kGrant ? "+\n" : "-\n");
       }
     }
