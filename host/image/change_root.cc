@@ -59,9 +59,13 @@ void TakeMountNamespace() {
     if (errno != EPERM) RefuseToEnter("unshare", errno);
     TakeUserNamespace();
   }
-  if (mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0) {
-    RefuseToEnter("mount", errno);
-  }
+  if (mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0) return;
+  if (errno != EINVAL) RefuseToEnter("mount", errno);
+  // The kernel changes what others see of a mount by the place of that mount alone.
+  throw HostError(
+      "the host cannot be entered: a directory outside it is to be visible in it, and the root "
+      "directory of this process is no mount point, as in a plain chroot; \"mount --bind DIR DIR\" "
+      "before \"chroot DIR\" makes it one");
 }
 
 std::vector<VisibleTree> TakeHoldOf(const std::vector<std::string>& paths) {

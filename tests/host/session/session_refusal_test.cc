@@ -102,6 +102,26 @@ TEST_F(SessionRefusalTest, VisibleDirectoryWhereTheImageHasAFile) {
   });
 }
 
+// As in a plain chroot.
+TEST_F(SessionRefusalTest, VisibleDirectoryForAProcessWhoseRootIsNoMountPoint) {
+  Assembled();
+  const std::filesystem::path host = Path();
+  InChild([&] {
+    if (geteuid() != 0) {
+      ASSERT_EQ(unshare(CLONE_NEWUSER), 0);
+    }
+    ASSERT_EQ(chroot(host.parent_path().c_str()), 0);
+    ASSERT_EQ(chdir("/"), 0);
+    EXPECT_EQ(MessageOf<HostError>([&] {
+                Session(HostDirectory("/" + host.filename().string()), Showing("/policy"));
+              }),
+              "the host cannot be entered: a directory outside it is to be visible in it, and the "
+              "root directory of this process is no mount point, as in a plain chroot; \"mount "
+              "--bind DIR DIR\" before \"chroot DIR\" makes it one");
+  });
+  EXPECT_FALSE(Exists("root/policy"));
+}
+
 // Has the kernel refuse to make namespaces, as it does where they are switched off.
 void RefuseNamespaces(unsigned int error) {
   scmp_filter_ctx filter = seccomp_init(SCMP_ACT_ALLOW);
