@@ -5,6 +5,7 @@
 #include <cerrno>
 #include <cstring>
 
+#include "host/image/change_root.h"
 #include "tests/host/session/session_fixture.h"
 
 namespace StandIn {
@@ -112,9 +113,8 @@ TEST_F(SessionRefusalTest, VisibleDirectoryForAProcessWhoseRootIsNoMountPoint) {
     }
     ASSERT_EQ(chroot(host.parent_path().c_str()), 0);
     ASSERT_EQ(chdir("/"), 0);
-    EXPECT_EQ(MessageOf<HostError>([&] {
-                Session(HostDirectory("/" + host.filename().string()), Showing("/policy"));
-              }),
+    const HostDirectory inChroot("/" + host.filename().string());
+    EXPECT_EQ(MessageOf<HostError>([&] { ChangeRoot(inChroot.Ref(), {"/policy"}); }),
               "the host cannot be entered: a directory outside it is to be visible in it, and the "
               "root directory of this process is no mount point, as in a plain chroot; \"mount "
               "--bind DIR DIR\" before \"chroot DIR\" makes it one");
