@@ -96,7 +96,7 @@ static_assert(offsetof(ZekAccess_FileRule, path) == 0);
 static_assert(sizeof(ZekAccess_FileRule::path) == 1984);
 static_assert(offsetof(ZekAccess_FileRule, permission) == 1984);
 static_assert(sizeof(ZekAccess_FileRule) == 1988 && alignof(ZekAccess_FileRule) == 4);
-static_assert(sizeof(ZekAccess_FileRule[2]) == 2 * 1988, "an array has no gaps");
+static_assert(sizeof(ZekAccess_FileRule[2]) == 3976, "an array has no gaps");
 
 // ---- Numbers -------------------------------------------------------------------------------
 
@@ -130,9 +130,11 @@ static_assert(ZekCtl::Util::kInodeStatsNode == 0x0417);
 // ---- Classes of the platform ---------------------------------------------------------------
 
 // One pointer to what the implementation keeps, and no table of virtual functions.
-static_assert(sizeof(ZekAccessInterfaceImpl) == 8 && alignof(ZekAccessInterfaceImpl) == 8);
+static_assert(sizeof(ZekAccessInterfaceImpl) == 8);
+static_assert(alignof(ZekAccessInterfaceImpl) == 8);
 static_assert(!std::is_polymorphic_v<ZekAccessInterfaceImpl>);
-static_assert(sizeof(ZekCtl::Util::Sysinfo) == 8 && alignof(ZekCtl::Util::Sysinfo) == 8);
+static_assert(sizeof(ZekCtl::Util::Sysinfo) == 8);
+static_assert(alignof(ZekCtl::Util::Sysinfo) == 8);
 static_assert(!std::is_polymorphic_v<ZekCtl::Util::Sysinfo>);
 static_assert(sizeof(ZekCtl::Util::InodeStats) == 544);
 static_assert(offsetof(ZekCtl::Util::InodeStats, tardiskName) == 32);

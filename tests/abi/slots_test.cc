@@ -77,6 +77,7 @@ class Counted : public Base {
  public:
   using Base::Base;
   ~Counted() override { ++ends.destroyed; }
+  // NOLINTNEXTLINE(misc-new-delete-overloads): only deletions are counted
   static void operator delete(void* memory) noexcept {
     ++ends.deleted;
     ::operator delete(memory);

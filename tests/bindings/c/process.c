@@ -1,5 +1,4 @@
 /* What a call leaves of the process that makes it: everything. */
-#define _GNU_SOURCE
 #include <dirent.h>
 #include <errno.h>
 #include <fcntl.h>

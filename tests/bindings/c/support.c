@@ -1,4 +1,3 @@
-#define _XOPEN_SOURCE 700
 #include "tests/bindings/c/support.h"
 
 #include <ftw.h>

@@ -1,5 +1,4 @@
 /* Calls from several threads, and in the midst of what others do. */
-#define _GNU_SOURCE
 #include <fcntl.h>
 #include <link.h>
 #include <pthread.h>
