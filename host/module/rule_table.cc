@@ -1,21 +1,18 @@
 #include "host/module/rule_table.h"
 
-#include <algorithm>
-#include <string_view>
+#include <limits>
+#include <stdexcept>
+#include <utility>
 
 namespace StandIn {
 
 namespace {
 
-std::string Joined(const FewWords& words) {
-  std::size_t size = words.size();
-  for (const std::string& word : words) size += word.size();
-  std::string joined;
-  joined.reserve(size);
-  for (const std::string& word : words) {
-    joined.append(word).push_back('\0');
-  }
-  return joined;
+// From how many dropped rules on it is worth while to make room.
+constexpr std::size_t kManyDropped = 1024;
+
+void AppendWords(std::string& text, const FewWords& words) {
+  for (const std::string& word : words) text.append(word).push_back('\0');
 }
 
 FewWords Separated(std::string_view joined) {
@@ -31,40 +28,82 @@ FewWords Separated(std::string_view joined) {
 }  // namespace
 
 std::optional<DomainId> RuleTable::Set(const Rule& rule) {
-  const auto [entry, isNew] = decided_.try_emplace(
-      Joined(rule.words), Decided{next_, rule.line, rule.targetDomain, rule.decision});
-  if (isNew) {
-    ++next_;
-    return std::nullopt;
+  if (decided_.size() > 2 * index_.size() + kManyDropped) Compact();
+  const std::size_t text = text_.size();
+  const std::size_t places = decided_.size();
+  try {
+    AppendWords(text_, rule.words);
+    return SetLastWords(text, rule);
+  } catch (...) {
+    decided_.resize(places);
+    text_.resize(text);
+    throw;
   }
-  Decided& decided = entry->second;
-  const DomainId replaced = decided.targetDomain;
-  decided = {decided.place, rule.line, rule.targetDomain, rule.decision};
-  return replaced;
 }
 
-bool RuleTable::Holds(const FewWords& words) const { return decided_.contains(Joined(words)); }
+// Decides on the words that stand at the end of text_, from `text` on.
+std::optional<DomainId> RuleTable::SetLastWords(std::size_t text, const Rule& rule) {
+  const std::string_view words = std::string_view(text_).substr(text);
+  if (const auto found = index_.find(words); found != index_.end()) {
+    text_.resize(text);
+    Decided& decided = decided_[*found];
+    decided.line = rule.line;
+    decided.decision = rule.decision;
+    return std::exchange(decided.target, rule.targetDomain);
+  }
+  if (decided_.size() > std::numeric_limits<Place>::max() ||
+      words.size() > std::numeric_limits<std::uint32_t>::max()) {
+    throw std::length_error("a table of rules is full");
+  }
+  const auto place = static_cast<Place>(decided_.size());
+  decided_.push_back({text, static_cast<std::uint32_t>(words.size()), rule.line, rule.targetDomain,
+                      rule.decision});
+  index_.insert(place);
+  return std::nullopt;
+}
 
-std::size_t RuleTable::DropTarget(DomainId target) {
-  return std::erase_if(decided_,
-                       [target](const auto& entry) { return entry.second.targetDomain == target; });
+bool RuleTable::Holds(const FewWords& words) const {
+  std::string joined;
+  AppendWords(joined, words);
+  return index_.contains(std::string_view(joined));
+}
+
+void RuleTable::DropTarget(DomainId target) {
+  for (Place place = 0; place < decided_.size(); ++place) {
+    Decided& decided = decided_[place];
+    if (!decided.isHeld || decided.target != target) continue;
+    index_.erase(WordsAt(place));
+    decided.isHeld = false;
+  }
 }
 
 std::vector<Rule> RuleTable::Rules() const {
-  using Entry = decltype(decided_)::value_type;
-  std::vector<const Entry*> entries;
-  entries.reserve(decided_.size());
-  for (const Entry& entry : decided_) entries.push_back(&entry);
-  std::sort(entries.begin(), entries.end(),
-            [](const Entry* a, const Entry* b) { return a->second.place < b->second.place; });
-
   std::vector<Rule> rules;
-  rules.reserve(entries.size());
-  for (const auto* entry : entries) {
-    const auto& [words, decided] = *entry;
-    rules.push_back({decided.line, Separated(words), decided.targetDomain, decided.decision});
+  rules.reserve(Size());
+  for (const Decided& decided : decided_) {
+    if (!decided.isHeld) continue;
+    const std::string_view words = std::string_view(text_).substr(decided.text, decided.size);
+    rules.push_back({decided.line, Separated(words), decided.target, decided.decision});
   }
   return rules;
+}
+
+// Gives back the room of what was dropped.
+void RuleTable::Compact() {
+  std::string text;
+  std::vector<Decided> held;
+  held.reserve(Size());
+  for (const Decided& decided : decided_) {
+    if (!decided.isHeld) continue;
+    held.push_back(decided);
+    held.back().text = text.size();
+    text.append(text_, decided.text, decided.size);
+  }
+  // From here on nothing throws: the index has had room for as many.
+  text_ = std::move(text);
+  decided_ = std::move(held);
+  index_.clear();
+  for (Place place = 0; place < decided_.size(); ++place) index_.insert(place);
 }
 
 }  // namespace StandIn

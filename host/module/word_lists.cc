@@ -67,12 +67,8 @@ std::vector<std::string> Capabilities() {
 }  // namespace
 
 const WordListInfo* InfoOf(WordList list) {
-  for (const WordListInfo& info : kWordLists) {
-    if (info.list == list) {
-      return &info;
-    }
-  }
-  return nullptr;
+  const std::size_t index = static_cast<std::size_t>(list) - 1;
+  return index < kWordLists.size() ? &kWordLists[index] : nullptr;
 }
 
 std::vector<std::string> DefaultWords(WordList list) {
