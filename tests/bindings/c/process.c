@@ -19,12 +19,13 @@ static void CallEverything(const struct fixture* fixture) {
   const secpolicy_search_terms terms = {.size = sizeof terms};
   secpolicy_policy* policy = NULL;
   secpolicy_text* texts[6] = {NULL};
+  secpolicy_text* none = NULL;
   const char* const dir = PolicyOf(fixture);
   CHECK(secpolicy_host_assemble(fixture->host, NULL) == SECPOLICY_OK);
   CHECK(secpolicy_load(fixture->host, dir, &texts[0], NULL) == SECPOLICY_LOAD_FAILED);
   CHECK(secpolicy_show(fixture->host, SECPOLICY_ALL_DOMAINS, &texts[1], NULL) == SECPOLICY_OK);
   CHECK(secpolicy_check(fixture->host, dir, &texts[2], NULL) == SECPOLICY_OK);
-  CHECK(secpolicy_check(fixture->host, "/none", &texts[2], NULL) == SECPOLICY_FAILED);
+  CHECK(secpolicy_check(fixture->host, "/none", &none, NULL) == SECPOLICY_FAILED);
   CHECK(secpolicy_policy_read(fixture->host, dir, &policy, NULL) == SECPOLICY_OK);
   CHECK(secpolicy_search(policy, &terms, &texts[3], NULL) == SECPOLICY_OK);
   CHECK(secpolicy_may(policy, "appDom", words, 2, &texts[4], NULL) == SECPOLICY_OK);
