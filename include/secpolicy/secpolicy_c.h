@@ -32,8 +32,8 @@
  * This covers no locks of replacements for the C library's functions, such as an allocator without
  * handlers for fork.
  *
- * Not for processes that have entered a host themselves (see host/gate/gate.h), or whose own
- * system-call filter forbids what entering one needs. */
+ * Not for processes that have entered a host themselves (secpolicy/host/entered_host.h), or whose
+ * own system-call filter forbids what entering one needs. */
 #ifndef SECPOLICY_SECPOLICY_C_H
 #define SECPOLICY_SECPOLICY_C_H
 
