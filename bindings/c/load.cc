@@ -2,6 +2,7 @@
 #include <syslog.h>
 
 #include <algorithm>
+#include <nlohmann/json.hpp>
 #include <utility>
 
 #include "bindings/c/text.h"

@@ -1,5 +1,6 @@
 // Policies as they were read, and questions to them.
 #include <memory>
+#include <nlohmann/json.hpp>
 #include <utility>
 
 #include "bindings/c/text.h"

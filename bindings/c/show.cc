@@ -1,4 +1,5 @@
 // What a kernel holds, and what a check finds.
+#include <nlohmann/json.hpp>
 #include <optional>
 
 #include "bindings/c/text.h"

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <nlohmann/json.hpp>
 #include <set>
 #include <string_view>
 

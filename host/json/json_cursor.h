@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <initializer_list>
 #include <memory>
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <optional>
 #include <string>
 #include <utility>

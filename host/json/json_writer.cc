@@ -1,5 +1,7 @@
 #include "host/json/json_writer.h"
 
+#include <nlohmann/json.hpp>
+
 namespace StandIn {
 
 using nlohmann::json;

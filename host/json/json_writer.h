@@ -1,7 +1,7 @@
 // Writing of JSON documents that people read and compare: what belongs together stands on one line.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 #include <vector>
 

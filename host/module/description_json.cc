@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <nlohmann/json.hpp>
 
 #include "host/json/json_cursor.h"
 #include "host/json/json_writer.h"

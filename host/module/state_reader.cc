@@ -1,4 +1,5 @@
 #include <limits>
+#include <nlohmann/json.hpp>
 #include <set>
 
 #include "host/json/json_cursor.h"

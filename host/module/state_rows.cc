@@ -1,5 +1,6 @@
 #include "host/module/state_rows.h"
 
+#include <nlohmann/json.hpp>
 #include <optional>
 
 #include "host/module/json_names.h"

@@ -1,7 +1,7 @@
 // The rows that rules are kept in: one on a line of a saved state.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <utility>
 
 #include "host/json/json_cursor.h"

@@ -1,4 +1,6 @@
 #include "host/json/json_cursor.h"
+
+#include <nlohmann/json.hpp>
 #include "host/json/json_writer.h"
 #include "host/module/json_names.h"
 #include "host/module/state_fields.h"

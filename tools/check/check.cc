@@ -1,6 +1,7 @@
 #include "tools/check/check.h"
 
 #include <filesystem>
+#include <nlohmann/json.hpp>
 #include <utility>
 
 #include "platform/tavon_strcat.h"

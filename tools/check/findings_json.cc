@@ -1,6 +1,7 @@
 #include "tools/check/findings_json.h"
 
 #include <array>
+#include <nlohmann/json.hpp>
 #include <utility>
 
 namespace SecPolicyTool {

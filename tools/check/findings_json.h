@@ -2,7 +2,7 @@
 // are.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <vector>
 
 #include "tools/check/finding.h"

@@ -1,5 +1,7 @@
 #include "tools/check/report_forms.h"
 
+#include <nlohmann/json.hpp>
+
 namespace SecPolicyTool {
 
 using nlohmann::json;

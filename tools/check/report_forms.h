@@ -1,7 +1,7 @@
 // The forms in which the findings of a check are handed over.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 
 #include "tools/check/check.h"

@@ -2,6 +2,7 @@
 #include <algorithm>
 #include <cctype>
 #include <filesystem>
+#include <nlohmann/json.hpp>
 #include <string_view>
 
 #include "tools/check/finding_kinds.h"

@@ -1,7 +1,7 @@
 // The forms in which a transition graph is given out.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 
 #include "tools/graph/transition_graph.h"

@@ -1,4 +1,6 @@
 #include "tools/graph/graph_forms.h"
+
+#include <nlohmann/json.hpp>
 #include "tools/policy/policy_json.h"
 
 namespace SecPolicyTool {

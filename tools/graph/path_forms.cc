@@ -1,6 +1,7 @@
 #include "tools/graph/path_forms.h"
 
 #include <algorithm>
+#include <nlohmann/json.hpp>
 #include <stdexcept>
 
 #include "tools/policy/policy_json.h"

@@ -1,7 +1,7 @@
 // What is asked about paths between domains, and the forms in which the answer is given out.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <optional>
 #include <string>
 

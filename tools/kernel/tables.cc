@@ -1,6 +1,7 @@
 #include "tools/kernel/tables.h"
 
 #include <charconv>
+#include <nlohmann/json.hpp>
 #include <optional>
 #include <stdexcept>
 

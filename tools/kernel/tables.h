@@ -1,7 +1,7 @@
 // Tables of the kernel that may grow while they are read.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 #include <vector>
 

@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <nlohmann/json.hpp>
 #include <system_error>
 
 #include "host/image/file_io.h"

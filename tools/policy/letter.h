@@ -1,7 +1,7 @@
 // What a child process leaves behind for its parent.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 #include <string_view>
 

@@ -1,6 +1,7 @@
 #include "tools/policy/output.h"
 
 #include <iostream>
+#include <nlohmann/json.hpp>
 #include <stdexcept>
 
 namespace SecPolicyTool {

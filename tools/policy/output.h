@@ -1,7 +1,7 @@
 // What the command tells its user.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 
 namespace SecPolicyTool {

@@ -1,5 +1,7 @@
 #include "tools/policy/policy_json.h"
 
+#include <nlohmann/json.hpp>
+
 namespace SecPolicyTool {
 
 using nlohmann::json;

@@ -2,7 +2,7 @@
 // are, so its form for people needs them made printable first.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 
 #include "tools/policy/policy.h"
 

@@ -1,4 +1,6 @@
 #include "tools/query/difference_report.h"
+
+#include <nlohmann/json.hpp>
 #include "tools/query/rule_json.h"
 
 namespace SecPolicyTool {

@@ -1,5 +1,7 @@
 #include "tools/query/rule_json.h"
 
+#include <nlohmann/json.hpp>
+
 #include "tools/policy/policy_json.h"
 
 namespace SecPolicyTool {

@@ -1,7 +1,7 @@
 // Rules in the JSON that programs read.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 
 #include "tools/policy/policy.h"
 

@@ -1,6 +1,7 @@
 #include "tools/query/test_report.h"
 
 #include <algorithm>
+#include <nlohmann/json.hpp>
 #include <ostream>
 
 #include "tools/query/rule_json.h"

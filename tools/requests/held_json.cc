@@ -1,5 +1,7 @@
 #include "tools/requests/held_json.h"
 
+#include <nlohmann/json.hpp>
+
 #include "secpolicy/secpolicy.h"
 #include "tools/kernel/tables.h"
 #include "tools/policy/held_policy.h"

@@ -1,7 +1,7 @@
 // What a kernel holds, as programs read it.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <optional>
 
 #include "host/image/image_index.h"

@@ -1,5 +1,6 @@
 #include "tools/requests/questions.h"
 
+#include <nlohmann/json.hpp>
 #include <utility>
 
 #include "tools/query/rule_json.h"

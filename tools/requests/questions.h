@@ -1,7 +1,7 @@
 // Questions to a policy, and the answers as programs read them.
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 #include <vector>
 

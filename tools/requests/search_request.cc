@@ -1,5 +1,6 @@
 #include "tools/requests/search_request.h"
 
+#include <nlohmann/json.hpp>
 #include <regex>
 
 #include "tools/policy/terminal.h"

@@ -6,16 +6,17 @@
 
 namespace SecPolicyTool {
 
-void AddAskingOptions(CLI::App& verb, AskingArguments& arguments) {
-  AddHostOption(verb, arguments.host);
-  AddJsonOption(verb, arguments.isJson);
-  AddPolicyOption(verb, arguments.policy);
+std::vector<CommandOption> AskingOptions(AskingArguments& arguments) {
+  return {HostOption(arguments.host), JsonOption(arguments.isJson), PolicyOption(arguments.policy)};
 }
 
-void AddQuestion(CLI::App& verb, std::vector<std::string>& words) {
-  verb.add_option("OPERATION", words, "What is asked about, and of what")
-      ->type_name("OPERATION OBJECT...")
-      ->required();
+CommandOption QuestionOperand(std::vector<std::string>& words) {
+  return {.names = {"OPERATION"},
+          .value = "OBJECT",
+          .description = "What is asked about, and of what",
+          .store = Into(words),
+          .isRequired = true,
+          .isRepeatable = true};
 }
 
 AskedPolicy ReadAsked(const AskingArguments& arguments, OnErrors onErrors) {
@@ -27,7 +28,7 @@ AskedPolicy ReadAskedFor(const std::vector<std::string>& words, const AskingArgu
   try {
     CheckForm(words);
   } catch (const BadQuestion& problem) {
-    throw CLI::ValidationError("OPERATION", problem.what());
+    throw UsageError("OPERATION", problem.what());
   }
   return ReadAsked(arguments, OnErrors::kWarn);
 }

@@ -1,7 +1,6 @@
 // What the verbs that ask a policy have in common.
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <string>
 #include <vector>
 
@@ -16,17 +15,16 @@ struct AskingArguments {
   bool isJson = false;
 };
 
-// Adds "--host", "--policy" and "--json".
-void AddAskingOptions(CLI::App& verb, AskingArguments& arguments);
+// "--host", "--json" and "--policy".
+std::vector<CommandOption> AskingOptions(AskingArguments& arguments);
 
-// Adds the positional arguments of a question, to be read in the verb's callback.
-void AddQuestion(CLI::App& verb, std::vector<std::string>& words);
+// The words of a question: all that are left.
+CommandOption QuestionOperand(std::vector<std::string>& words);
 
 // The policy that is asked. Throws as ReadPolicy does.
 AskedPolicy ReadAsked(const AskingArguments& arguments, OnErrors onErrors);
 
-// The same for a question, whose form is checked first. Throws CLI::ValidationError when that is
-// wrong.
+// The same for a question, whose form is checked first. Throws UsageError when that is wrong.
 AskedPolicy ReadAskedFor(const std::vector<std::string>& words, const AskingArguments& arguments);
 
 }  // namespace SecPolicyTool

@@ -6,11 +6,13 @@
 #include <algorithm>
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "tools/check/finding_kinds.h"
 #include "tools/check/report_forms.h"
 #include "tools/policy/output.h"
 #include "tools/secpolicy/host_option.h"
+#include "tools/secpolicy/source_option.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
@@ -61,31 +63,35 @@ ExitStatus Check(const CheckArguments& arguments) {
   return isFailed ? kFailed : kDone;
 }
 
-// For CLI11: the text of what is wrong with an id, or nothing.
+// What is wrong with an id, or nothing.
 std::string IdProblem(const std::string& id) {
   return IsWarningId(id) ? "" : "no warning has the id " + id + "; known are: " + WarningIds();
 }
 
 }  // namespace
 
-void AddCheck(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("check", "Say everything that is wrong with a policy");
+CommandLine CheckVerb() {
   const auto arguments = std::make_shared<CheckArguments>();
-  AddHostOption(*verb, arguments->host);
-  AddJsonOption(*verb, arguments->isJson);
-  verb->add_option("--format", arguments->format, "The form of the findings")
-      ->excludes("--json")
-      ->type_name("text|json|sarif")
-      ->check(CLI::IsMember({"text", "json", "sarif"}));
-  verb->add_option("--no-warn", arguments->silenced, "Leave out the warnings of this id")
-      ->type_name("ID")
-      ->allow_extra_args(false)  // what follows is the policy directory
-      ->check(IdProblem);
-  verb->add_flag("--error-on-warning", arguments->isErrorOnWarning,
-                 "Fail on warnings as on errors");
-  verb->add_option("DIR", arguments->dir,
-                   "The policy directory; without it, the host's own /etc/olvane/secpolicy");
-  verb->callback([arguments, &status] { status = Check(*arguments); });
+  return {.name = "check",
+          .description = "Say everything that is wrong with a policy",
+          .options = {HostOption(arguments->host),
+                      JsonOption(arguments->isJson),
+                      {.names = {"--format"},
+                       .value = "FORMAT",
+                       .description = "The form of the findings",
+                       .store = Into(arguments->format),
+                       .choices = {"text", "json", "sarif"},
+                       .excludes = "--json"},
+                      {.names = {"--no-warn"},
+                       .value = "ID",
+                       .description = "Leave out the warnings of this id",
+                       .store = Checked(IdProblem, Into(arguments->silenced)),
+                       .isRepeatable = true},
+                      {.names = {"--error-on-warning"},
+                       .description = "Fail on warnings as on errors",
+                       .store = Into(arguments->isErrorOnWarning)}},
+          .operands = {OwnPolicyOperand(arguments->dir, "DIR")},
+          .run = [arguments] { return Check(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

@@ -1,29 +1,37 @@
 // secpolicy completion bash|zsh|json
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
-#include "tools/completion/command_line.h"
 #include "tools/policy/output.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
 
-void AddCompletion(CLI::App& app, ExitStatus&) {
-  CLI::App* verb = app.add_subcommand(
-      "completion", "Print what completes the command line in a shell, or describes it");
+namespace {
+
+ExitStatus PrintDescription(const CommandLine& line, const std::string& form) {
+  if (form == "json") {
+    PrintJson(ToJson(line));
+  } else {
+    std::cout << (form == "bash" ? BashCompletion(line) : ZshCompletion(line));
+  }
+  return kDone;
+}
+
+}  // namespace
+
+CommandLine CompletionVerb(const CommandLine& line) {
   const auto form = std::make_shared<std::string>();
-  verb->add_option("FORM", *form,
-                   "A shell, whose script is to be sourced; json for a description of all verbs")
-      ->required()
-      ->check(CLI::IsMember({"bash", "zsh", "json"}));
-  verb->callback([form, &app] {
-    const CommandLine line = CommandLineOf(app);
-    if (*form == "json") {
-      PrintJson(ToJson(line));
-    } else {
-      std::cout << (*form == "bash" ? BashCompletion(line) : ZshCompletion(line));
-    }
-  });
+  return {.name = "completion",
+          .description = "Print what completes the command line in a shell, or describes it",
+          .operands = {{.names = {"FORM"},
+                        .description = "A shell, whose script is to be sourced; json for a "
+                                       "description of all verbs",
+                        .store = Into(*form),
+                        .choices = {"bash", "zsh", "json"},
+                        .isRequired = true}},
+          .run = [&line, form] { return PrintDescription(line, *form); }};
 }
 
 }  // namespace SecPolicyTool

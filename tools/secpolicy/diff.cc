@@ -3,6 +3,7 @@
 
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "tools/policy/output.h"
 #include "tools/query/difference_report.h"
@@ -41,17 +42,17 @@ ExitStatus Diff(const DiffArguments& arguments) {
 
 }  // namespace
 
-void AddDiff(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("diff", "Say in what two policies differ");
-  verb->footer(
-      "+ is only in B, - is only in A, ~ is another in B; nothing is printed when they mean the\n"
-      "same. Exit status: 0 equal, 1 different, or an error was reported, 2 wrong usage.");
+CommandLine DiffVerb() {
   const auto arguments = std::make_shared<DiffArguments>();
-  AddHostOption(*verb, arguments->host);
-  AddJsonOption(*verb, arguments->isJson);
-  AddSourceOption(*verb, arguments->before, "A");
-  AddSourceOption(*verb, arguments->after, "B");
-  verb->callback([arguments, &status] { status = Diff(*arguments); });
+  return {.name = "diff",
+          .description = "Say in what two policies differ",
+          .footer =
+              "+ is only in B, - is only in A, ~ is another in B; nothing is printed when they "
+              "mean the\nsame. Exit status: 0 equal, 1 different, or an error was reported, 2 "
+              "wrong usage.",
+          .options = {HostOption(arguments->host), JsonOption(arguments->isJson)},
+          .operands = {SourceOperand(arguments->before, "A"), SourceOperand(arguments->after, "B")},
+          .run = [arguments] { return Diff(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

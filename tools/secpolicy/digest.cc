@@ -3,6 +3,7 @@
 
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "tools/policy/output.h"
 #include "tools/secpolicy/host_option.h"
@@ -19,7 +20,7 @@ struct DigestArguments {
   bool isJson = false;
 };
 
-void PrintDigest(const DigestArguments& arguments) {
+ExitStatus PrintDigest(const DigestArguments& arguments) {
   const std::string digest =
       Digest(ReadPolicy(arguments.host, arguments.source, OnErrors::kRefuse));
   if (arguments.isJson) {
@@ -27,17 +28,18 @@ void PrintDigest(const DigestArguments& arguments) {
   } else {
     std::cout << digest << "\n";
   }
+  return kDone;
 }
 
 }  // namespace
 
-void AddDigest(CLI::App& app, ExitStatus&) {
-  CLI::App* verb = app.add_subcommand("digest", "Print one word for what a policy means");
+CommandLine DigestVerb() {
   const auto arguments = std::make_shared<DigestArguments>();
-  AddHostOption(*verb, arguments->host);
-  AddJsonOption(*verb, arguments->isJson);
-  AddSourceOption(*verb, arguments->source);
-  verb->callback([arguments] { PrintDigest(*arguments); });
+  return {.name = "digest",
+          .description = "Print one word for what a policy means",
+          .options = {HostOption(arguments->host), JsonOption(arguments->isJson)},
+          .operands = {SourceOperand(arguments->source)},
+          .run = [arguments] { return PrintDigest(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

@@ -1,6 +1,7 @@
 // secpolicy domain list|create|destroy|name|of|leaked
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "secpolicy/secpolicy.h"
 #include "tools/kernel/tables.h"
@@ -79,46 +80,60 @@ void Leaked(const DomainArguments& arguments) {
   if (arguments.isJson) PrintJson({{"leaked", rows}});
 }
 
-using Arguments = std::shared_ptr<DomainArguments>;
+using SharedDomainArguments = std::shared_ptr<DomainArguments>;
 
 // A verb below "domain" which does `run` in the host.
-CLI::App* AddVerb(CLI::App& domain, const char* name, const char* description,
-                  const Arguments& arguments, void (*run)(const DomainArguments&)) {
-  CLI::App* verb = domain.add_subcommand(name, description);
-  AddHostOption(*verb, arguments->host);
-  verb->callback([arguments, run] {
-    const auto session = EnterHost(arguments->host);
-    run(*arguments);
-  });
-  return verb;
+CommandLine DomainVerbOf(const char* name, const char* description,
+                         const SharedDomainArguments& arguments,
+                         void (*run)(const DomainArguments&),
+                         std::vector<CommandOption> operands = {}) {
+  return {.name = name,
+          .description = description,
+          .options = {HostOption(arguments->host)},
+          .operands = std::move(operands),
+          .run = [arguments, run] {
+            const auto session = EnterHost(arguments->host);
+            run(*arguments);
+            return kDone;
+          }};
+}
+
+CommandOption DomainOperand(const SharedDomainArguments& arguments, const char* name,
+                            const char* description) {
+  return {.names = {name},
+          .description = description,
+          .store = Into(arguments->domain),
+          .isRequired = true};
+}
+
+CommandOption WorldOperand(const SharedDomainArguments& arguments) {
+  return {.names = {"WORLD"},
+          .description = "The world: a process id",
+          .store = [arguments](const std::string& text) { arguments->world = WorldId(text); },
+          .isRequired = true};
 }
 
 }  // namespace
 
-void AddDomain(CLI::App& app, ExitStatus&) {
-  CLI::App* domain = app.add_subcommand("domain", "List, make and destroy a kernel's domains");
-  domain->require_subcommand(1);
+CommandLine DomainVerb() {
   const auto arguments = std::make_shared<DomainArguments>();
-  const auto add = [&](const char* name, const char* description, auto run) {
-    return AddVerb(*domain, name, description, arguments, run);
-  };
-  const auto addDomain = [&](CLI::App* verb, const char* name, const char* description) {
-    verb->add_option(name, arguments->domain, description)->required();
-    return verb;
-  };
-  constexpr char kDomain[] = "The domain: its name or its id";
-  AddJsonOption(*add("list", "List the domains with their ids", List), arguments->isJson);
-  AddJsonOption(*addDomain(add("create", "Make an empty domain, as host services do", Create),
-                           "NAME", "The new domain's name"),
-                arguments->isJson);
-  addDomain(add("destroy", "Destroy a domain", Destroy), "DOMAIN", kDomain);
-  AddJsonOption(*addDomain(add("name", "Print a domain's id and name", Name), "DOMAIN", kDomain),
-                arguments->isJson);
-  CLI::App* of = add("of", "Print the domain that a process runs in", Of);
-  of->add_option("WORLD", arguments->world, "The world: a process id")->required();
-  AddJsonOption(*of, arguments->isJson);
-  AddJsonOption(*add("leaked", "List the domains that their makers left behind", Leaked),
-                arguments->isJson);
+  const CommandOption domain = DomainOperand(arguments, "DOMAIN", "The domain: its name or its id");
+  CommandLine verb{
+      .name = "domain",
+      .description = "List, make and destroy a kernel's domains",
+      .verbs = {DomainVerbOf("list", "List the domains with their ids", arguments, List),
+                DomainVerbOf("create", "Make an empty domain, as host services do", arguments,
+                             Create, {DomainOperand(arguments, "NAME", "The new domain's name")}),
+                DomainVerbOf("destroy", "Destroy a domain", arguments, Destroy, {domain}),
+                DomainVerbOf("name", "Print a domain's id and name", arguments, Name, {domain}),
+                DomainVerbOf("of", "Print the domain that a process runs in", arguments, Of,
+                             {WorldOperand(arguments)}),
+                DomainVerbOf("leaked", "List the domains that their makers left behind", arguments,
+                             Leaked)}};
+  for (CommandLine& below : verb.verbs) {
+    if (below.name != "destroy") below.options.push_back(JsonOption(arguments->isJson));
+  }
+  return verb;
 }
 
 }  // namespace SecPolicyTool

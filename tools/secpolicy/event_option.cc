@@ -14,9 +14,11 @@ namespace SecPolicyTool {
 
 using StandIn::WordList;
 
-void AddEventOption(CLI::App& verb, std::optional<std::string>& event) {
-  verb.add_option("--event", event, "Only transitions on this event, for example \"exec\"")
-      ->type_name("EVENT");
+CommandOption EventOption(std::optional<std::string>& event) {
+  return {.names = {"--event"},
+          .value = "EVENT",
+          .description = "Only transitions on this event, for example \"exec\"",
+          .store = Into(event)};
 }
 
 void RequireEvent(const std::string& host, const std::optional<std::string>& event) {

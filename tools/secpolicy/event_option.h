@@ -1,14 +1,15 @@
 // The one transition event that a verb is asked about.
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <optional>
 #include <string>
 
+#include "tools/command_line/command_line.h"
+
 namespace SecPolicyTool {
 
-// Adds "--event EVENT" to a verb.
-void AddEventOption(CLI::App& verb, std::optional<std::string>& event);
+// "--event EVENT".
+CommandOption EventOption(std::optional<std::string>& event);
 
 // Throws std::runtime_error `unknown transition event "EVENT"`, with the nearest one where there is
 // one, when the host's kernel knows no such event, and as OpenHost does.

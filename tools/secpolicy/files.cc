@@ -2,6 +2,7 @@
 #include <algorithm>
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 #include <stdexcept>
 
 #include "secpolicy/secpolicy.h"
@@ -26,7 +27,7 @@ struct FilesArguments {
   std::string domain;  // a name or an id
   std::string path;
   std::string newPath;
-  std::string permission;
+  std::uint32_t permission = 0;
   int world = 0;
 };
 
@@ -64,14 +65,13 @@ void Add(const FilesArguments& arguments) {
                              " bytes");
   }
   std::copy(arguments.path.begin(), arguments.path.end(), rule.path);
-  rule.permission = ParsePermission(arguments.permission);
+  rule.permission = arguments.permission;
   unsigned int taken = 0;
   SecPolicy::AddFilePolicyBatch(arguments.world, DomainOf(arguments), &rule, 1, &taken);
 }
 
 void Update(const FilesArguments& arguments) {
-  SecPolicy::UpdateFilePolicy(DomainOf(arguments), arguments.path,
-                              ParsePermission(arguments.permission));
+  SecPolicy::UpdateFilePolicy(DomainOf(arguments), arguments.path, arguments.permission);
 }
 
 void Remove(const FilesArguments& arguments) {
@@ -82,80 +82,77 @@ void Rename(const FilesArguments& arguments) {
   SecPolicy::ReplaceFilePolicyVMs(arguments.path, arguments.newPath);
 }
 
-// For CLI11: the text of what is wrong with a permission, or nothing.
-std::string PermissionProblem(const std::string& letters) try {
-  ParsePermission(letters);
-  return {};
-} catch (const std::invalid_argument& problem) {
-  return problem.what();
+using SharedFilesArguments = std::shared_ptr<FilesArguments>;
+
+CommandOption Required(const char* name, const char* description, Store store) {
+  return {
+      .names = {name}, .description = description, .store = std::move(store), .isRequired = true};
 }
 
-// Puts the verbs below "files" together.
-class Verbs {
- public:
-  explicit Verbs(CLI::App& files) : files_(files) {}
+CommandOption RuleDomainOperand(const SharedFilesArguments& arguments) {
+  return Required("DOMAIN", "Its name or its id", Into(arguments->domain));
+}
 
-  // A verb which does `run` in the host; the options below are added to the last one.
-  Verbs& Add(const char* name, const char* description, void (*run)(const FilesArguments&)) {
-    verb_ = files_.add_subcommand(name, description);
-    AddHostOption(*verb_, arguments_->host);
-    verb_->callback([arguments = arguments_, run] {
-      const auto session = EnterHost(arguments->host);
-      run(*arguments);
-    });
-    return *this;
-  }
-  Verbs& Domain() { return Required("DOMAIN", arguments_->domain, "Its name or its id"); }
-  Verbs& Path(const char* name = "PATH") {
-    return Required(name, arguments_->path, "The path that the rule is for");
-  }
-  Verbs& NewPath() { return Required("NEW", arguments_->newPath, "The path that it gets"); }
-  Verbs& Permission() {
-    verb_->add_option("PERMISSION", arguments_->permission, R"(Letters of "rwx", or "-" for none)")
-        ->required()
-        ->check(PermissionProblem);
-    return *this;
-  }
-  Verbs& World() {
-    verb_->add_option("--world", arguments_->world,
-                      "The one process that the rule is for; without it, the whole domain");
-    return *this;
-  }
-  Verbs& Json() {
-    AddJsonOption(*verb_, arguments_->isJson);
-    return *this;
-  }
+CommandOption PathOperand(const SharedFilesArguments& arguments, const char* name = "PATH") {
+  return Required(name, "The path that the rule is for", Into(arguments->path));
+}
 
- private:
-  Verbs& Required(const char* name, std::string& value, const char* description) {
-    verb_->add_option(name, value, description)->required();
-    return *this;
-  }
+CommandOption PermissionOperand(const SharedFilesArguments& arguments) {
+  return Required("PERMISSION", R"(Letters of "rwx", or "-" for none)",
+                  [arguments](const std::string& letters) {
+                    arguments->permission = ParsePermission(letters);
+                  });
+}
 
-  CLI::App& files_;
-  CLI::App* verb_ = nullptr;
-  std::shared_ptr<FilesArguments> arguments_ = std::make_shared<FilesArguments>();
-};
+CommandOption WorldOption(const SharedFilesArguments& arguments) {
+  return {.names = {"--world"},
+          .value = "WORLD",
+          .description = "The one process that the rule is for; without it, the whole domain",
+          .store = [arguments](const std::string& text) { arguments->world = WorldId(text); }};
+}
+
+// A verb below "files" which does `run` in the host.
+CommandLine FilesVerbOf(const char* name, const char* description,
+                        const SharedFilesArguments& arguments, void (*run)(const FilesArguments&),
+                        std::vector<CommandOption> operands,
+                        const std::vector<CommandOption>& options = {}) {
+  CommandLine verb{.name = name,
+                   .description = description,
+                   .options = {HostOption(arguments->host)},
+                   .operands = std::move(operands),
+                   .run = [arguments, run] {
+                     const auto session = EnterHost(arguments->host);
+                     run(*arguments);
+                     return kDone;
+                   }};
+  verb.options.insert(verb.options.end(), options.begin(), options.end());
+  return verb;
+}
 
 }  // namespace
 
-void AddFiles(CLI::App& app, ExitStatus&) {
-  CLI::App* files = app.add_subcommand("files", "Read and change a domain's file rules directly");
-  files->require_subcommand(1);
-  Verbs verbs(*files);
-  verbs.Add("list", "List a domain's file rules", List).Domain().Json();
-  verbs.Add("add", "Add a rule, or give an existing one another permission", Add)
-      .Domain()
-      .Path()
-      .Permission()
-      .World();
-  verbs.Add("update", "Give the rules of a path another permission", Update)
-      .Domain()
-      .Path()
-      .Permission();
-  verbs.Add("remove", "Remove a rule", Remove).Domain().Path().World();
-  verbs.Add("rename", "Rename a path in the rules of all domains", Rename).Path("OLD").NewPath();
-  verbs.Add("count", "Print the number of a domain's file rules", Count).Domain().Json();
+CommandLine FilesVerb() {
+  const auto arguments = std::make_shared<FilesArguments>();
+  const CommandOption domain = RuleDomainOperand(arguments);
+  const CommandOption path = PathOperand(arguments);
+  const CommandOption permission = PermissionOperand(arguments);
+  const CommandOption jsonOption = JsonOption(arguments->isJson);
+  const CommandOption world = WorldOption(arguments);
+  return {.name = "files",
+          .description = "Read and change a domain's file rules directly",
+          .verbs = {
+              FilesVerbOf("list", "List a domain's file rules", arguments, List, {domain},
+                          {jsonOption}),
+              FilesVerbOf("add", "Add a rule, or give an existing one another permission",
+                          arguments, Add, {domain, path, permission}, {world}),
+              FilesVerbOf("update", "Give the rules of a path another permission", arguments,
+                          Update, {domain, path, permission}),
+              FilesVerbOf("remove", "Remove a rule", arguments, Remove, {domain, path}, {world}),
+              FilesVerbOf("rename", "Rename a path in the rules of all domains", arguments, Rename,
+                          {PathOperand(arguments, "OLD"),
+                           Required("NEW", "The path that it gets", Into(arguments->newPath))}),
+              FilesVerbOf("count", "Print the number of a domain's file rules", arguments, Count,
+                          {domain}, {jsonOption})}};
 }
 
 }  // namespace SecPolicyTool

@@ -3,6 +3,7 @@
 
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 #include <optional>
 
 #include "tools/graph/graph_forms.h"
@@ -40,7 +41,7 @@ std::string Formatted(const GraphArguments& arguments, const TransitionGraph& gr
   return GraphText(graph, Painter(arguments.file.empty() && WantsColour(STDOUT_FILENO)));
 }
 
-void PrintGraph(const GraphArguments& arguments) {
+ExitStatus PrintGraph(const GraphArguments& arguments) {
   RequireEvent(arguments.host, arguments.event);
   const Policy policy = ReadPolicy(arguments.host, arguments.source, OnErrors::kWarn);
   const std::string text = Formatted(arguments, TransitionGraph(policy, arguments.event));
@@ -49,26 +50,34 @@ void PrintGraph(const GraphArguments& arguments) {
   } else {
     WriteOutputFile(arguments.file, text);
   }
+  return kDone;
 }
 
 }  // namespace
 
-void AddGraph(CLI::App& app, ExitStatus&) {
-  CLI::App* verb = app.add_subcommand("graph", "Show which domain goes where");
+CommandLine GraphVerb() {
   const auto arguments = std::make_shared<GraphArguments>();
-  AddHostOption(*verb, arguments->host);
-  CLI::Option* format =
-      verb->add_option("--format", arguments->format,
-                       "text, json, dot (the language of Graphviz) or svg (drawn by Graphviz)")
-          ->type_name("FORMAT")
-          ->check(CLI::IsMember({"text", "json", "dot", "svg"}))
-          ->capture_default_str();
-  verb->add_flag("--json", arguments->isJson, "The same as --format json")->excludes(format);
-  AddEventOption(*verb, arguments->event);
-  verb->add_option("-o,--output", arguments->file, "Write to this file, whole or not at all")
-      ->type_name("FILE");
-  AddSourceOption(*verb, arguments->source);
-  verb->callback([arguments] { PrintGraph(*arguments); });
+  return {.name = "graph",
+          .description = "Show which domain goes where",
+          .options = {HostOption(arguments->host),
+                      {.names = {"--format"},
+                       .value = "FORMAT",
+                       .description =
+                           "text, json, dot (the language of Graphviz) or svg (drawn by Graphviz)",
+                       .store = Into(arguments->format),
+                       .choices = {"text", "json", "dot", "svg"},
+                       .defaultValue = arguments->format,
+                       .excludes = "--json"},
+                      {.names = {"--json"},
+                       .description = "The same as --format json",
+                       .store = Into(arguments->isJson)},
+                      EventOption(arguments->event),
+                      {.names = {"-o", "--output"},
+                       .value = "FILE",
+                       .description = "Write to this file, whole or not at all",
+                       .store = Into(arguments->file)}},
+          .operands = {SourceOperand(arguments->source)},
+          .run = [arguments] { return PrintGraph(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

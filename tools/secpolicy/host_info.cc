@@ -8,6 +8,7 @@
 #include "host/image/state_keeper.h"
 #include "host/module/description_json.h"
 #include "host/module/simulated_module.h"
+#include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
@@ -72,12 +73,15 @@ void PrintInfo(const HostDirectory& host) {
 
 }  // namespace
 
-void AddHostInfo(CLI::App& app, ExitStatus&) {
-  CLI::App* verb =
-      app.add_subcommand("info", "Say what a host is made of and what its kernel holds");
+CommandLine HostInfoVerb() {
   const auto dir = std::make_shared<std::string>();
-  verb->add_option("DIR", *dir, "The host directory")->type_name("DIR")->required();
-  verb->callback([dir] { PrintInfo(HostDirectory(*dir)); });
+  return {.name = "info",
+          .description = "Say what a host is made of and what its kernel holds",
+          .operands = {HostOperand(*dir, "The host directory")},
+          .run = [dir] {
+            PrintInfo(HostDirectory(*dir));
+            return kDone;
+          }};
 }
 
 }  // namespace SecPolicyTool

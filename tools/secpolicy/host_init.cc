@@ -4,19 +4,28 @@
 
 #include "host/image/host_directory.h"
 #include "host/module/description_json.h"
+#include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
 
-void AddHostInit(CLI::App& app, ExitStatus&) {
-  CLI::App* verb = app.add_subcommand("init", "Make a host directory with the default description");
+namespace {
+
+ExitStatus MakeHost(const std::string& dir) {
+  StandIn::HostDirectory::Create(dir, StandIn::DefaultDescriptionText());
+  std::cerr << "Made the host directory " + dir + ". Put its tardisks into " + dir +
+                   "/tardisks, then run: secpolicy host assemble " + dir + "\n";
+  return kDone;
+}
+
+}  // namespace
+
+CommandLine HostInitVerb() {
   const auto dir = std::make_shared<std::string>();
-  verb->add_option("DIR", *dir, "The directory to make")->type_name("DIR")->required();
-  verb->callback([dir] {
-    StandIn::HostDirectory::Create(*dir, StandIn::DefaultDescriptionText());
-    std::cerr << "Made the host directory " + *dir + ". Put its tardisks into " + *dir +
-                     "/tardisks, then run: secpolicy host assemble " + *dir + "\n";
-  });
+  return {.name = "init",
+          .description = "Make a host directory with the default description",
+          .operands = {HostOperand(*dir, "The directory to make")},
+          .run = [dir] { return MakeHost(*dir); }};
 }
 
 }  // namespace SecPolicyTool

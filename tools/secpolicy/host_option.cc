@@ -46,14 +46,24 @@ HostDirectory OpenOwnHost() {
 
 }  // namespace
 
-void AddHostOption(CLI::App& verb, std::string& dir) {
-  verb.add_option("--host", dir,
-                  "The host directory; without it, one of your own is used, and made on first use")
-      ->type_name("DIR");
+CommandOption HostOption(std::string& dir) {
+  return {.names = {"--host"},
+          .value = "DIR",
+          .description =
+              "The host directory; without it, one of your own is used, and made on first use",
+          .store = Into(dir)};
 }
 
-void AddJsonOption(CLI::App& verb, bool& isJson) {
-  verb.add_flag("--json", isJson, "Print JSON, for programs");
+CommandOption HostOperand(std::string& dir, const std::string& description) {
+  return {.names = {"DIR"},
+          .value = "DIR",
+          .description = description,
+          .store = Into(dir),
+          .isRequired = true};
+}
+
+CommandOption JsonOption(bool& isJson) {
+  return {.names = {"--json"}, .description = "Print JSON, for programs", .store = Into(isJson)};
 }
 
 HostDirectory OpenHost(const std::string& dir) {

@@ -12,4 +12,7 @@ namespace SecPolicyTool {
 std::unique_ptr<StandIn::Session> EnterHost(const std::string& dir,
                                             const StandIn::SessionOptions& options = {});
 
+// A world of a host: a process id. Throws std::invalid_argument as WholeNumber does.
+int WorldId(const std::string& text);
+
 }  // namespace SecPolicyTool

@@ -3,6 +3,7 @@
 
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 #include <stdexcept>
 
 #include "secpolicy/secpolicy.h"
@@ -166,35 +167,67 @@ ExitStatus RunVerify(const LabelArguments& arguments) {
   return results.status;
 }
 
+using SharedLabelArguments = std::shared_ptr<LabelArguments>;
+
+// A verb below "label" which does `run` with the files below PATH.
+CommandLine LabelVerbOf(const char* name, const char* description,
+                        const SharedLabelArguments& arguments,
+                        ExitStatus (*run)(const LabelArguments&)) {
+  return {.name = name,
+          .description = description,
+          .options = {HostOption(arguments->host),
+                      {.names = {"-R", "--recursive"},
+                       .description =
+                           "The directory and everything below it, links and sockets excepted",
+                       .store = Into(arguments->isTree)}},
+          .operands = {{.names = {"PATH"},
+                        .description = "An absolute path in the host",
+                        .store = Into(arguments->path),
+                        .isRequired = true}},
+          .run = [arguments, run] {
+            RequireAbsolute(arguments->path);
+            return run(*arguments);
+          }};
+}
+
+CommandLine GetVerb(const SharedLabelArguments& arguments) {
+  CommandLine verb = LabelVerbOf("get", "Print the labels of files", arguments, RunGet);
+  verb.options.push_back(JsonOption(arguments->isJson));
+  return verb;
+}
+
+CommandLine SetVerb(const SharedLabelArguments& arguments) {
+  CommandLine verb = LabelVerbOf("set", "Set the labels of files", arguments, RunSet);
+  verb.operands.push_back({.names = {"LABEL"},
+                           .description = "The object label",
+                           .store = Into(arguments->label),
+                           .isRequired = true});
+  verb.options.push_back({.names = {"-n", "--dry-run"},
+                          .description = "Only show what would change",
+                          .store = Into(arguments->isDryRun)});
+  return verb;
+}
+
+CommandLine VerifyVerb(const SharedLabelArguments& arguments) {
+  CommandLine verb =
+      LabelVerbOf("verify", "List the files that carry another label than a policy gives them",
+                  arguments, RunVerify);
+  verb.options.push_back(
+      {.names = {"--policy"},
+       .value = "DIR",
+       .description = "The policy directory; without it, the host's own /etc/olvane/secpolicy",
+       .store = Into(arguments->policy)});
+  verb.options.push_back(JsonOption(arguments->isJson));
+  return verb;
+}
+
 }  // namespace
 
-void AddLabel(CLI::App& app, ExitStatus& status) {
-  CLI::App* label = app.add_subcommand("label", "Read, set and compare the labels of files");
-  label->require_subcommand(1);
+CommandLine LabelVerb() {
   const auto arguments = std::make_shared<LabelArguments>();
-  const auto add = [&](const char* name, const char* description, auto run) {
-    CLI::App* verb = label->add_subcommand(name, description);
-    AddHostOption(*verb, arguments->host);
-    verb->add_flag("-R,--recursive", arguments->isTree,
-                   "The directory and everything below it, links and sockets excepted");
-    verb->add_option("PATH", arguments->path, "An absolute path in the host")->required();
-    verb->callback([arguments, run, &status] {
-      RequireAbsolute(arguments->path);
-      status = run(*arguments);
-    });
-    return verb;
-  };
-  AddJsonOption(*add("get", "Print the labels of files", RunGet), arguments->isJson);
-  CLI::App* set = add("set", "Set the labels of files", RunSet);
-  set->add_option("LABEL", arguments->label, "The object label")->required();
-  set->add_flag("-n,--dry-run", arguments->isDryRun, "Only show what would change");
-  CLI::App* verify =
-      add("verify", "List the files that carry another label than a policy gives them", RunVerify);
-  verify
-      ->add_option("--policy", arguments->policy,
-                   "The policy directory; without it, the host's own /etc/olvane/secpolicy")
-      ->type_name("DIR");
-  AddJsonOption(*verify, arguments->isJson);
+  return {.name = "label",
+          .description = "Read, set and compare the labels of files",
+          .verbs = {GetVerb(arguments), SetVerb(arguments), VerifyVerb(arguments)}};
 }
 
 }  // namespace SecPolicyTool

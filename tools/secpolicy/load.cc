@@ -16,6 +16,7 @@
 #include "tools/policy/progress_filter.h"
 #include "tools/requests/batch_load.h"
 #include "tools/secpolicy/host_option.h"
+#include "tools/secpolicy/source_option.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
@@ -99,35 +100,26 @@ ExitStatus Load(const LoadArguments& arguments) {
   return static_cast<ExitStatus>(WEXITSTATUS(status));
 }
 
-// For CLI11: the text of what is wrong with a fault, or nothing.
-std::string FaultProblem(const std::string& text) try {
-  StandIn::ParseFault(text);
-  return {};
-} catch (const std::invalid_argument& problem) {
-  return problem.what();
-}
-
 }  // namespace
 
-void AddLoad(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("load", "Load a policy into a host's kernel");
+CommandLine LoadVerb() {
   const auto arguments = std::make_shared<LoadArguments>();
-  const auto faults = std::make_shared<std::vector<std::string>>();
-  AddHostOption(*verb, arguments->host);
-  verb->add_flag("--trace", arguments->trace, "Show every kernel operation");
-  verb->add_option("--fail", *faults, "Have the kernel refuse the N-th call (1) of an operation")
-      ->type_name("OPERATION[:N]")
-      ->allow_extra_args(false)  // what follows is the policy directory
-      ->check(FaultProblem);
-  verb->add_option("POLICYDIR", arguments->policy,
-                   "The policy directory; without it, the host's own /etc/olvane/secpolicy")
-      ->type_name("DIR");
-  verb->callback([arguments, faults, &status] {
-    for (const std::string& fault : *faults) {
-      arguments->faults.push_back(StandIn::ParseFault(fault));
-    }
-    status = Load(*arguments);
-  });
+  return {.name = "load",
+          .description = "Load a policy into a host's kernel",
+          .options = {HostOption(arguments->host),
+                      {.names = {"--trace"},
+                       .description = "Show every kernel operation",
+                       .store = Into(arguments->trace)},
+                      {.names = {"--fail"},
+                       .value = "OPERATION[:N]",
+                       .description = "Have the kernel refuse the N-th call (1) of an operation",
+                       .store =
+                           [arguments](const std::string& fault) {
+                             arguments->faults.push_back(StandIn::ParseFault(fault));
+                           },
+                       .isRepeatable = true}},
+          .operands = {OwnPolicyOperand(arguments->policy, "POLICYDIR")},
+          .run = [arguments] { return Load(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

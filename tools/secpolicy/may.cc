@@ -3,6 +3,7 @@
 
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "tools/policy/output.h"
 #include "tools/policy/terminal.h"
@@ -37,15 +38,20 @@ ExitStatus PrintAnswer(const MayArguments& arguments) {
 
 }  // namespace
 
-void AddMay(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("may", "Ask whether a domain is allowed something");
-  verb->footer("Questions:\n" + QuestionForms() +
-               "\nExit status: 0 allowed, 1 not allowed, or an error was reported, 2 wrong usage.");
+CommandLine MayVerb() {
   const auto arguments = std::make_shared<MayArguments>();
-  AddAskingOptions(*verb, arguments->asking);
-  verb->add_option("DOMAIN", arguments->domain, "The domain")->required();
-  AddQuestion(*verb, arguments->words);
-  verb->callback([arguments, &status] { status = PrintAnswer(*arguments); });
+  return {
+      .name = "may",
+      .description = "Ask whether a domain is allowed something",
+      .footer = "Questions:\n" + QuestionForms() +
+                "\nExit status: 0 allowed, 1 not allowed, or an error was reported, 2 wrong usage.",
+      .options = AskingOptions(arguments->asking),
+      .operands = {{.names = {"DOMAIN"},
+                    .description = "The domain",
+                    .store = Into(arguments->domain),
+                    .isRequired = true},
+                   QuestionOperand(arguments->words)},
+      .run = [arguments] { return PrintAnswer(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

@@ -3,6 +3,7 @@
 
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 #include <optional>
 #include <stdexcept>
 
@@ -50,22 +51,38 @@ ExitStatus PrintPaths(const PathsArguments& arguments) {
 
 }  // namespace
 
-void AddPaths(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("paths", "Say how one domain is reached from another");
-  verb->footer("Exit status: 0 it is reached, 1 it is not, or the request failed, 2 wrong usage.");
+CommandLine PathsVerb() {
   const auto arguments = std::make_shared<PathsArguments>();
-  AddHostOption(*verb, arguments->host);
-  AddJsonOption(*verb, arguments->isJson);
-  AddEventOption(*verb, arguments->event);
-  AddPolicyOption(*verb, arguments->source);
-  CLI::Option* most = verb->add_option("--max", arguments->most, "At most so many paths")
-                          ->type_name("N")
-                          ->check(CLI::Range(std::size_t{1}, kMostPaths))
-                          ->capture_default_str();
-  verb->add_flag("--all", arguments->isAll, "All paths, but at most 1000")->excludes(most);
-  verb->add_option("FROM", arguments->from, "The domain that programs come from")->required();
-  verb->add_option("TO", arguments->to, "The domain that they go to")->required();
-  verb->callback([arguments, &status] { status = PrintPaths(*arguments); });
+  return {
+      .name = "paths",
+      .description = "Say how one domain is reached from another",
+      .footer = "Exit status: 0 it is reached, 1 it is not, or the request failed, 2 wrong usage.",
+      .options = {HostOption(arguments->host),
+                  JsonOption(arguments->isJson),
+                  EventOption(arguments->event),
+                  PolicyOption(arguments->source),
+                  {.names = {"--max"},
+                   .value = "N",
+                   .description = "At most so many paths, from 1 to 1000",
+                   .store =
+                       [arguments](const std::string& text) {
+                         arguments->most =
+                             static_cast<std::size_t>(WholeNumber(text, 1, kMostPaths));
+                       },
+                   .defaultValue = std::to_string(arguments->most),
+                   .excludes = "--all"},
+                  {.names = {"--all"},
+                   .description = "All paths, but at most 1000",
+                   .store = Into(arguments->isAll)}},
+      .operands = {{.names = {"FROM"},
+                    .description = "The domain that programs come from",
+                    .store = Into(arguments->from),
+                    .isRequired = true},
+                   {.names = {"TO"},
+                    .description = "The domain that they go to",
+                    .store = Into(arguments->to),
+                    .isRequired = true}},
+      .run = [arguments] { return PrintPaths(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

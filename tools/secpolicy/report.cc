@@ -3,6 +3,7 @@
 
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "tools/check/check.h"
 #include "tools/policy/output.h"
@@ -52,17 +53,24 @@ void WriteReport(const ReportArguments& arguments) {
 
 }  // namespace
 
-void AddReport(CLI::App& app, ExitStatus&) {
-  CLI::App* verb = app.add_subcommand("report", "Write a page that shows what a policy says");
+CommandLine ReportVerb() {
   const auto arguments = std::make_shared<ReportArguments>();
-  AddHostOption(*verb, arguments->host);
-  AddJsonOption(*verb, arguments->isJson);
-  verb->add_option("-o,--output", arguments->file,
-                   "The page: one HTML file that needs no other; written whole or not at all")
-      ->type_name("FILE")
-      ->required();
-  AddSourceOption(*verb, arguments->source);
-  verb->callback([arguments] { WriteReport(*arguments); });
+  return {
+      .name = "report",
+      .description = "Write a page that shows what a policy says",
+      .options = {HostOption(arguments->host),
+                  JsonOption(arguments->isJson),
+                  {.names = {"-o", "--output"},
+                   .value = "FILE",
+                   .description = "The page: one HTML file that needs no other; written whole or "
+                                  "not at all",
+                   .store = Into(arguments->file),
+                   .isRequired = true}},
+      .operands = {SourceOperand(arguments->source)},
+      .run = [arguments] {
+        WriteReport(*arguments);
+        return kDone;
+      }};
 }
 
 }  // namespace SecPolicyTool

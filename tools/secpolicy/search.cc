@@ -1,6 +1,7 @@
 // secpolicy search [--host DIR] [--json] SOURCE [terms]
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "tools/policy/output.h"
 #include "tools/query/bad_request.h"
@@ -34,7 +35,7 @@ SearchRequest RequestOf(const SearchArguments& arguments) {
 void RequireTerms(const SearchRequest& request, const HostPaths& paths) try {
   TermsOf(request, paths);
 } catch (const BadRequest& problem) {
-  throw CLI::ValidationError("--word", problem.what());
+  throw UsageError("--word", problem.what());
 }
 
 ExitStatus PrintFound(const SearchArguments& arguments) {
@@ -53,31 +54,45 @@ ExitStatus PrintFound(const SearchArguments& arguments) {
 
 }  // namespace
 
-void AddSearch(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("search", "Find rules of a policy");
-  verb->footer("Exit status: 0 found, 1 nothing found, or an error was reported, 2 wrong usage.");
+CommandLine SearchVerb() {
   const auto arguments = std::make_shared<SearchArguments>();
-  AddHostOption(*verb, arguments->host);
-  AddJsonOption(*verb, arguments->isJson);
-  AddSourceOption(*verb, arguments->source);
-  verb->add_option("--domain", arguments->request.domain, "Rules of this domain")
-      ->type_name("NAME");
-  verb->add_option("--type", arguments->request.type, "Rules of this type, such as -s or syscall")
-      ->type_name("TYPE")
-      ->check(TypeProblem);
-  CLI::Option* word = verb->add_option("--word", arguments->request.word, "Rules with this word")
-                          ->type_name("WORD");
-  verb->add_flag("--regex", arguments->isRegex, "The word is a regular expression (ECMAScript)")
-      ->needs(word);
-  verb->add_option("--path", arguments->request.path,
-                   "Path rules that decide on this path, or are for something below it")
-      ->type_name("PATH")
-      ->check(PathProblem);
-  CLI::Option* granted =
-      verb->add_flag("--granted", arguments->isGranted, "Rules that grant, or permit something");
-  verb->add_flag("--revoked", arguments->isRevoked, "Rules that revoke, or permit nothing")
-      ->excludes(granted);
-  verb->callback([arguments, &status] { status = PrintFound(*arguments); });
+  SearchRequest& request = arguments->request;
+  return {
+      .name = "search",
+      .description = "Find rules of a policy",
+      .footer = "Exit status: 0 found, 1 nothing found, or an error was reported, 2 wrong usage.",
+      .options = {HostOption(arguments->host),
+                  JsonOption(arguments->isJson),
+                  {.names = {"--domain"},
+                   .value = "NAME",
+                   .description = "Rules of this domain",
+                   .store = Into(request.domain)},
+                  {.names = {"--type"},
+                   .value = "TYPE",
+                   .description = "Rules of this type, such as -s or syscall",
+                   .store = Checked(TypeProblem, Into(request.type))},
+                  {.names = {"--word"},
+                   .value = "WORD",
+                   .description = "Rules with this word",
+                   .store = Into(request.word)},
+                  {.names = {"--regex"},
+                   .description = "The word is a regular expression (ECMAScript)",
+                   .store = Into(arguments->isRegex),
+                   .needs = "--word"},
+                  {.names = {"--path"},
+                   .value = "PATH",
+                   .description =
+                       "Path rules that decide on this path, or are for something below it",
+                   .store = Checked(PathProblem, Into(request.path))},
+                  {.names = {"--granted"},
+                   .description = "Rules that grant, or permit something",
+                   .store = Into(arguments->isGranted)},
+                  {.names = {"--revoked"},
+                   .description = "Rules that revoke, or permit nothing",
+                   .store = Into(arguments->isRevoked),
+                   .excludes = "--granted"}},
+      .operands = {SourceOperand(arguments->source)},
+      .run = [arguments] { return PrintFound(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

@@ -1,5 +1,7 @@
 // secpolicy show [--host DIR] [--json] [DOMAIN-ID]
+#include <limits>
 #include <memory>
+#include <nlohmann/json.hpp>
 #include <optional>
 #include <stdexcept>
 
@@ -42,13 +44,22 @@ void Show(const ShowArguments& arguments) {
 
 }  // namespace
 
-void AddShow(CLI::App& app, ExitStatus&) {
-  CLI::App* verb = app.add_subcommand("show", "Print the policy that a host's kernel holds");
+CommandLine ShowVerb() {
   const auto arguments = std::make_shared<ShowArguments>();
-  AddHostOption(*verb, arguments->host);
-  AddJsonOption(*verb, arguments->isJson);
-  verb->add_option("DOMAIN-ID", arguments->domain, "The one domain to show; without it, all");
-  verb->callback([arguments] { Show(*arguments); });
+  return {.name = "show",
+          .description = "Print the policy that a host's kernel holds",
+          .options = {HostOption(arguments->host), JsonOption(arguments->isJson)},
+          .operands = {{.names = {"DOMAIN-ID"},
+                        .description = "The one domain to show; without it, all",
+                        .store =
+                            [arguments](const std::string& text) {
+                              arguments->domain = static_cast<unsigned int>(
+                                  WholeNumber(text, 0, std::numeric_limits<unsigned int>::max()));
+                            }}},
+          .run = [arguments] {
+            Show(*arguments);
+            return kDone;
+          }};
 }
 
 }  // namespace SecPolicyTool

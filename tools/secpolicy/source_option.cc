@@ -8,19 +8,29 @@
 
 namespace SecPolicyTool {
 
-void AddSourceOption(CLI::App& verb, std::string& source, const std::string& name) {
-  verb.add_option(name, source,
-                  "A policy directory, or \"kernel\" for what the host's kernel holds")
-      ->type_name("DIR|kernel")
-      ->required();
+CommandOption SourceOperand(std::string& source, const std::string& name) {
+  return {.names = {name},
+          .value = "DIR|kernel",
+          .description = "A policy directory, or \"kernel\" for what the host's kernel holds",
+          .store = Into(source),
+          .isRequired = true};
 }
 
-void AddPolicyOption(CLI::App& verb, std::string& source) {
+CommandOption OwnPolicyOperand(std::string& dir, const std::string& name) {
+  return {.names = {name},
+          .value = "DIR",
+          .description = "The policy directory; without it, the host's own /etc/olvane/secpolicy",
+          .store = Into(dir)};
+}
+
+CommandOption PolicyOption(std::string& source) {
   source = kKernelSource;
-  verb.add_option("--policy", source,
-                  "The policy that is asked: a directory, or \"kernel\", as without it, for what "
-                  "the host's kernel holds")
-      ->type_name("DIR|kernel");
+  return {.names = {"--policy"},
+          .value = "DIR|kernel",
+          .description =
+              "The policy that is asked: a directory, or \"kernel\", as without it, for "
+              "what the host's kernel holds",
+          .store = Into(source)};
 }
 
 Policy ReadPolicy(const std::string& host, const std::string& source, OnErrors onErrors) {

@@ -1,18 +1,21 @@
 // The policy that a verb works on.
 #pragma once
 
-#include <CLI/CLI.hpp>
 #include <string>
 
+#include "tools/command_line/command_line.h"
 #include "tools/policy/policy_source.h"
 
 namespace SecPolicyTool {
 
-// Adds the positional argument SOURCE, with `name` if the verb has several.
-void AddSourceOption(CLI::App& verb, std::string& source, const std::string& name = "SOURCE");
+// The operand SOURCE, with another name if the verb has several.
+CommandOption SourceOperand(std::string& source, const std::string& name = "SOURCE");
 
-// Adds "--policy SOURCE", for verbs that ask a policy: what the host's kernel holds without it.
-void AddPolicyOption(CLI::App& verb, std::string& source);
+// The operand for a policy directory that need not be given: the host's own is meant then.
+CommandOption OwnPolicyOperand(std::string& dir, const std::string& name);
+
+// "--policy SOURCE", for verbs that ask a policy: what the host's kernel holds without it.
+CommandOption PolicyOption(std::string& source);
 
 // What is done with a directory of which a load reports errors.
 enum class OnErrors {

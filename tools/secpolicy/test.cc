@@ -5,6 +5,7 @@
 #include <cerrno>
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 #include <stdexcept>
 
 #include "host/image/file_io.h"
@@ -66,20 +67,29 @@ ExitStatus Test(const TestArguments& arguments) {
 
 }  // namespace
 
-void AddTest(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("test", "Run the unit tests of a policy");
-  verb->footer(
-      "A line of FILE is one of\n" + StatementForms() + "\nwith a question such as\n" +
-      QuestionForms() +
-      "\nExit status: 0 all hold, 1 some do not, or an error was reported, 2 wrong usage.");
+CommandLine TestVerb() {
   const auto arguments = std::make_shared<TestArguments>();
-  AddAskingOptions(*verb, arguments->asking);
-  verb->add_option("--format", arguments->format, "text, as without it, tap or json")
-      ->type_name("FORMAT")
-      ->check(CLI::IsMember({"text", "tap", "json"}))
-      ->excludes(verb->get_option("--json"));
-  verb->add_option("FILE", arguments->file, "The statements that have to hold")->required();
-  verb->callback([arguments, &status] { status = Test(*arguments); });
+  CommandLine verb{
+      .name = "test",
+      .description = "Run the unit tests of a policy",
+      .footer =
+          "A line of FILE is one of\n" + StatementForms() + "\nwith a question such as\n" +
+          QuestionForms() +
+          "\nExit status: 0 all hold, 1 some do not, or an error was reported, 2 wrong usage.",
+      .options = AskingOptions(arguments->asking),
+      .operands = {{.names = {"FILE"},
+                    .value = "FILE",
+                    .description = "The statements that have to hold",
+                    .store = Into(arguments->file),
+                    .isRequired = true}},
+      .run = [arguments] { return Test(*arguments); }};
+  verb.options.push_back({.names = {"--format"},
+                          .value = "FORMAT",
+                          .description = "text, as without it, tap or json",
+                          .store = Into(arguments->format),
+                          .choices = {"text", "tap", "json"},
+                          .excludes = "--json"});
+  return verb;
 }
 
 }  // namespace SecPolicyTool

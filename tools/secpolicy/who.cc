@@ -1,6 +1,7 @@
 // secpolicy who [--host DIR] [--policy SOURCE] [--json] OPERATION OBJECT...
 #include <iostream>
 #include <memory>
+#include <nlohmann/json.hpp>
 
 #include "tools/policy/output.h"
 #include "tools/policy/terminal.h"
@@ -32,15 +33,16 @@ ExitStatus PrintAllowed(const WhoArguments& arguments) {
 
 }  // namespace
 
-void AddWho(CLI::App& app, ExitStatus& status) {
-  CLI::App* verb = app.add_subcommand("who", "Ask which domains are allowed something");
-  verb->footer("Questions:\n" + QuestionForms() +
-               "\nExit status: 0 some domain is, 1 none is, or an error was reported, 2 wrong "
-               "usage.");
+CommandLine WhoVerb() {
   const auto arguments = std::make_shared<WhoArguments>();
-  AddAskingOptions(*verb, arguments->asking);
-  AddQuestion(*verb, arguments->words);
-  verb->callback([arguments, &status] { status = PrintAllowed(*arguments); });
+  return {.name = "who",
+          .description = "Ask which domains are allowed something",
+          .footer = "Questions:\n" + QuestionForms() +
+                    "\nExit status: 0 some domain is, 1 none is, or an error was reported, 2 wrong "
+                    "usage.",
+          .options = AskingOptions(arguments->asking),
+          .operands = {QuestionOperand(arguments->words)},
+          .run = [arguments] { return PrintAllowed(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

@@ -1,6 +1,7 @@
 #include "host/json/json_writer.h"
 
 #include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
 
 namespace StandIn {
 namespace {

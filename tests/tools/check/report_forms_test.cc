@@ -1,6 +1,8 @@
 // The forms in which findings are handed over.
 #include "tools/check/report_forms.h"
 
+#include <nlohmann/json.hpp>
+
 #include "tests/tools/check/check_fixture.h"
 #include "tests/tools/schema.h"
 #include "tools/check/line_excerpt.h"

@@ -1,5 +1,6 @@
 // secpolicy graph.
 #include <filesystem>
+#include <nlohmann/json.hpp>
 
 #include "tests/tools/command_fixture.h"
 #include "tests/tools/schema.h"

@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <cstdio>
+#include <nlohmann/json.hpp>
 
 #include "tests/host/image/temporary_directory.h"
 #include "tools/policy/letter.h"

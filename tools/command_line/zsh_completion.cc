@@ -1,5 +1,5 @@
 // Completion for zsh.
-#include "tools/completion/command_line.h"
+#include "tools/command_line/command_line.h"
 
 namespace SecPolicyTool {
 
@@ -50,8 +50,8 @@ std::string OptionSpecs(const CommandOption& option) {
 
 std::string Arguments(const CommandLine& line) {
   std::string arguments = "  _arguments -s";
-  for (const CommandOption& option : line.options) arguments += OptionSpecs(option);
-  for (const CommandOption& option : line.positionals) {
+  for (const CommandOption& option : AllOptions(line)) arguments += OptionSpecs(option);
+  for (const CommandOption& option : line.operands) {
     arguments += " \\\n    '" + Action(option) + "'";
   }
   return arguments;

@@ -1,7 +1,7 @@
 // Completion for bash.
 #include <functional>
 
-#include "tools/completion/command_line.h"
+#include "tools/command_line/command_line.h"
 
 namespace SecPolicyTool {
 
@@ -34,7 +34,7 @@ void ForEachVerb(const CommandLine& line, const std::string& path,
 std::string WordsOf(const CommandLine& line) {
   std::vector<std::string> words;
   for (const CommandLine& verb : line.verbs) words.push_back(verb.name);
-  for (const CommandOption& option : line.options) {
+  for (const CommandOption& option : AllOptions(line)) {
     words.insert(words.end(), option.names.begin(), option.names.end());
   }
   return Joined(words);
@@ -56,7 +56,7 @@ std::string Case(const std::string& pattern, const std::string& text) {
 std::string ValueCases(const std::string& path, const CommandLine& verb) {
   std::string cases;
   const std::string start = path + ":";
-  for (const CommandOption& option : verb.options) {
+  for (const CommandOption& option : AllOptions(verb)) {
     if (option.value.empty()) continue;
     for (const std::string& name : option.names) {
       cases += Case(start + name, Offer(option));
@@ -67,8 +67,8 @@ std::string ValueCases(const std::string& path, const CommandLine& verb) {
 
 std::string PositionalCases(const std::string& path, const CommandLine& verb) {
   std::string cases;
-  for (std::size_t i = 0; i < verb.positionals.size(); ++i) {
-    cases += Case(path + ":" + std::to_string(i), Offer(verb.positionals[i]));
+  for (std::size_t i = 0; i < verb.operands.size(); ++i) {
+    cases += Case(path + ":" + std::to_string(i), Offer(verb.operands[i]));
   }
   return cases;
 }
