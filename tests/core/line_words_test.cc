@@ -11,12 +11,12 @@ namespace {
 using StandIn::MessageOf;
 using Tavon::Lib::TavonException;
 
-struct Row {
+struct LineRow {
   std::string line;
   Words words;
 };
 
-const Row kWithoutComment[] = {
+const LineRow kWithoutComment[] = {
     {"", {}},
     {" ", {}},
     {"     ", {}},
@@ -45,7 +45,7 @@ const Row kWithoutComment[] = {
 };
 
 TEST(StringToQueueTest, SplitsAtSpacesOnly) {
-  for (const Row& row : kWithoutComment) {
+  for (const LineRow& row : kWithoutComment) {
     EXPECT_EQ(WordsOf(SecPolicy::StringToQueue(row.line)), row.words) << '"' << row.line << '"';
   }
 }
@@ -60,13 +60,13 @@ TEST(StringToQueueTest, LengthIsNotLimited) {
 }
 
 TEST(ParsePolicyLineTest, SplitsALineWithoutACommentAtSpacesOnly) {
-  for (const Row& row : kWithoutComment) {
+  for (const LineRow& row : kWithoutComment) {
     EXPECT_EQ(WordsOf(SecPolicy::ParsePolicyLine(row.line)), row.words) << '"' << row.line << '"';
   }
 }
 
 TEST(ParsePolicyLineTest, CommentBeginsAtTheFirstNumberSign) {
-  const Row rows[] = {
+  const LineRow rows[] = {
       {"grant /usr/lib r # shared libraries", {"grant", "/usr/lib", "r"}},
       {"# whole-line comment", {}},
       {"#", {}},
@@ -81,7 +81,7 @@ TEST(ParsePolicyLineTest, CommentBeginsAtTheFirstNumberSign) {
       {"a ; b", {"a", ";", "b"}},
       {"\t# after a tab", {"\t"}},
   };
-  for (const Row& row : rows) {
+  for (const LineRow& row : rows) {
     EXPECT_EQ(WordsOf(SecPolicy::ParsePolicyLine(row.line)), row.words) << '"' << row.line << '"';
   }
 }

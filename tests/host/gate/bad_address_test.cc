@@ -21,12 +21,12 @@ struct Good {
 };
 
 // A call with one address that is the test's.
-struct Row {
+struct BadAddress {
   const char* name;
   std::string (*ask)(void* address, Good& good);
 };
 
-const std::vector<Row> kCallsThatRead = {
+const std::vector<BadAddress> kCallsThatRead = {
     {"create-domain name",
      [](void* p, Good& good) { return Ask(PrivateCall::kCreateDomain, p, 0, &good.cell); }},
     {"update-rule path",
@@ -39,7 +39,7 @@ const std::vector<Row> kCallsThatRead = {
     {"replace-path new", [](void* p, Good&) { return Ask(PrivateCall::kReplacePath, "/held", p); }},
 };
 
-const std::vector<Row> kCallsThatWrite = {
+const std::vector<BadAddress> kCallsThatWrite = {
     {"create-domain id",
      [](void* p, Good&) { return Ask(PrivateCall::kCreateDomain, "newDom", 0, p); }},
     {"read-rules records",
@@ -59,10 +59,10 @@ const std::vector<Row> kCallsThatWrite = {
 };
 
 // The rows that do not answer that the address is bad, and what they answer.
-std::string NotRefused(const std::vector<Row>& rows, const std::vector<void*>& addresses) {
+std::string NotRefused(const std::vector<BadAddress>& rows, const std::vector<void*>& addresses) {
   std::string wrong;
   Good good;
-  for (const Row& row : rows) {
+  for (const BadAddress& row : rows) {
     for (void* address : addresses) {
       const std::string answer = row.ask(address, good);
       if (answer != "0xbad000e EFAULT") {

@@ -57,7 +57,7 @@ constexpr std::uint64_t kPassThrough = 0x401234;
 const std::vector<CodeRange> kOwnCode = {
     {0x401000, 0x402000}, {0x5'ffff'f000, 0x6'0000'1000}, {0x7f01'ffff'ff00, 0x7f03'0000'0100}};
 
-struct Row {
+struct FilterRow {
   const char* what;
   long number;
   std::uint64_t place;
@@ -66,9 +66,9 @@ struct Row {
   std::uint32_t architecture = kNative;
 };
 
-void ExpectVerdicts(const std::vector<Row>& rows) {
+void ExpectVerdicts(const std::vector<FilterRow>& rows) {
   const std::vector<sock_filter> program = BuildTrapFilter(kOwnCode, kPassThrough);
-  for (const Row& row : rows) {
+  for (const FilterRow& row : rows) {
     seccomp_data data{};
     data.nr = static_cast<int>(row.number);
     data.arch = row.architecture;

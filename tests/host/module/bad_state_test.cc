@@ -27,21 +27,21 @@ class BadStateTest : public PersistenceTest {
   }
 };
 
-struct Row {
+struct BadState {
   std::string text;
   std::string message;
 };
 
 TEST_F(BadStateTest, DocumentsThatAreNoState) {
   Fill();
-  const Row rows[] = {
+  const BadState rows[] = {
       {"[]", "kernel.json: /: must be an object"},
       {"{}", "kernel.json: /: lacks the member \"format\""},
       {R"({"format": 2, "new": 1})",
        "kernel.json: /format: format 2 is not known here, only format 1"},
       {R"({"format": 1, "domain": []})", "kernel.json: /domain: unknown member"},
   };
-  for (const Row& row : rows) {
+  for (const BadState& row : rows) {
     EXPECT_EQ(Refused(row.text), row.message);
   }
   EXPECT_THAT(Refused(""), testing::StartsWith("kernel.json:1:1: syntax error"));
@@ -51,7 +51,7 @@ TEST_F(BadStateTest, DocumentsThatAreNoState) {
 
 TEST_F(BadStateTest, Domains) {
   const std::string tooLong(128, 'n');
-  const Row rows[] = {
+  const BadState rows[] = {
       {"1", "/domains/1: must be an object"},
       {R"({"id": 2, "name": "b", "origin": "policy", "rule": []})",
        "/domains/1/rule: unknown member"},
@@ -91,13 +91,13 @@ TEST_F(BadStateTest, Domains) {
       {R"({"id": 2, "name": "b", "origin": "policy", "services": ["s", "s"]})",
        "/domains/1/services/1: is listed twice"},
   };
-  for (const Row& row : rows) {
+  for (const BadState& row : rows) {
     EXPECT_EQ(RefusedDomain(row.text), "kernel.json: " + row.message) << row.text;
   }
 }
 
 TEST_F(BadStateTest, Rules) {
-  const Row rows[] = {
+  const BadState rows[] = {
       {R"({})", ": must be an array"},
       {R"([{}])", "/0: must be an array"},
       {R"([[]])", "/0: must begin with the keyword of a kind of rules"},
@@ -120,7 +120,7 @@ TEST_F(BadStateTest, Rules) {
       {R"([["-s", 1, "open", "grant"], ["-s", 2, "open", "revoke"]])",
        "/1: the words of this rule are decided on already"},
   };
-  for (const Row& row : rows) {
+  for (const BadState& row : rows) {
     EXPECT_EQ(RefusedInDomain("\"rules\": " + row.text),
               "kernel.json: /domains/1/rules" + row.message)
         << row.text;
@@ -129,7 +129,7 @@ TEST_F(BadStateTest, Rules) {
 
 TEST_F(BadStateTest, FileRules) {
   const std::string tooLong = "/" + std::string(1983, 'p');
-  const Row rows[] = {
+  const BadState rows[] = {
       {R"([[0, "/a"]])", "/0: must have 3 elements"},
       {R"([[-1, "/a", "r"]])", "/0/0: must be a whole number from 0 to 2147483647"},
       {R"([[0, "a", "r"]])", "/0/1: is not absolute"},
@@ -141,7 +141,7 @@ TEST_F(BadStateTest, FileRules) {
       {R"([[0, "/a", ""], [1, "/a", ""], [0, "/b", ""], [0, "/c", ""]])",
        "/3: the domain has more than 3 file rules"},
   };
-  for (const Row& row : rows) {
+  for (const BadState& row : rows) {
     EXPECT_EQ(RefusedInDomain("\"fileRules\": " + row.text),
               "kernel.json: /domains/1/fileRules" + row.message)
         << row.text;
@@ -149,7 +149,7 @@ TEST_F(BadStateTest, FileRules) {
 }
 
 TEST_F(BadStateTest, RolesWorldsAndFileLabels) {
-  const Row rows[] = {
+  const BadState rows[] = {
       {R"("roles": [])", "/roles: must be an object"},
       {R"("roles": {"global": 0})", "/roles/global: unknown member"},
       {R"("roles": {"globalVM": 3})", "/roles/globalVM: no domain has the id 3"},
@@ -165,13 +165,13 @@ TEST_F(BadStateTest, RolesWorldsAndFileLabels) {
       {R"("fileLabels": [["/a", 3]])", "/fileLabels/0/1: no object label ever had the id 3"},
       {R"("fileLabels": [["/a", 1], ["/a", 2]])", "/fileLabels/1/0: is listed twice"},
   };
-  for (const Row& row : rows) {
+  for (const BadState& row : rows) {
     EXPECT_EQ(RefusedMember(row.text), "kernel.json: " + row.message) << row.text;
   }
 }
 
 TEST_F(BadStateTest, Labels) {
-  const Row rows[] = {
+  const BadState rows[] = {
       {R"([])", ": must be an object"},
       {R"({})", ": lacks the member \"next\""},
       {R"({"next": 0})", "/next: must be a whole number from 1 to 4294967295"},
@@ -191,7 +191,7 @@ TEST_F(BadStateTest, Labels) {
       {R"({"next": 1, "removed": [""]})", "/removed/0: is empty"},
       {R"({"next": 1, "removed": ["a", "a"]})", "/removed/1: is listed twice"},
   };
-  for (const Row& row : rows) {
+  for (const BadState& row : rows) {
     EXPECT_EQ(RefusedMember("\"labels\": {\"object\": " + row.text + "}"),
               "kernel.json: /labels/object" + row.message)
         << row.text;

@@ -11,7 +11,7 @@ namespace {
 using testing::ElementsAre;
 
 // An operation and its line.
-struct Row {
+struct TraceLine {
   const char* line;
   std::function<void(SecurityModule&)> call;
 };
@@ -24,8 +24,8 @@ class TraceLogTest : public TraceTest {
     Make("logDom");
   }
 
-  void ExpectLines(const std::vector<Row>& rows) {
-    for (const Row& row : rows) EXPECT_EQ(TraceOf([&] { row.call(observed_); }), row.line);
+  void ExpectLines(const std::vector<TraceLine>& rows) {
+    for (const TraceLine& row : rows) EXPECT_EQ(TraceOf([&] { row.call(observed_); }), row.line);
   }
 };
 
