@@ -8,11 +8,11 @@ set(SECPOLICY_PACKAGE_DIR ${CMAKE_INSTALL_LIBDIR}/cmake/SecPolicy)
 set(SECPOLICY_PKG_CONFIG_DIR ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 set(SECPOLICY_CMAKE_DIR ${CMAKE_CURRENT_LIST_DIR})
 
-# The dynamic loader looks into the system's own directories by itself. Below any other prefix,
-# `target`, installed in the folder `from`, finds its libraries from where it lies.
+# `target`, installed in the folder `from`, finds its libraries relative to its own place, whatever
+# the prefix: `cmake --install --prefix` may choose another one than was configured, and the loader's
+# cache need not know it. Distributions turn this off with CMAKE_SKIP_INSTALL_RPATH.
 function(secpolicy_find_libraries_from target from)
-  if(DEFINED CMAKE_INSTALL_RPATH OR CMAKE_INSTALL_PREFIX MATCHES "^/(usr(/local)?)?/?$"
-      OR IS_ABSOLUTE "${from}" OR IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}")
+  if(DEFINED CMAKE_INSTALL_RPATH OR IS_ABSOLUTE "${from}" OR IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}")
     return()
   endif()
   file(RELATIVE_PATH way "/${from}" "/${CMAKE_INSTALL_LIBDIR}")

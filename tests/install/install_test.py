@@ -21,8 +21,6 @@ import unittest
 BUILD = pathlib.Path(sys.argv[1]).resolve()
 SOURCE = pathlib.Path(sys.argv[2]).resolve()
 HERE = SOURCE / "tests" / "install"
-# A prefix in which the dynamic loader and others look by themselves.
-SYSTEM_PREFIX = re.compile(r"/(usr(/local)?)?/?")
 
 
 def cached(name: str) -> str:
@@ -82,12 +80,8 @@ class Installed(unittest.TestCase):
         cls.prefix = cls.work / "prefix"
         run(CMAKE, "--install", BUILD, "--prefix", cls.prefix)
 
-    def loader(self) -> dict[str, object]:
-        """For programs that lie in no system's prefix and were not told where their libraries are."""
-        return {"LD_LIBRARY_PATH": self.prefix / LIBDIR}
-
     def command(self, *arguments: object) -> subprocess.CompletedProcess[str]:
-        return run(self.prefix / "bin" / "secpolicy", *arguments, **self.loader())
+        return run(self.prefix / "bin" / "secpolicy", *arguments)
 
 
 class Files(Installed):
@@ -124,7 +118,10 @@ class Files(Installed):
                 # What a debugger reads is where the sources were; a package is stripped of it.
                 run("strip", "--strip-debug", path)
             text = path.read_bytes()
-            for place in (BUILD, SOURCE, self.prefix):
+            places = [BUILD, SOURCE, self.prefix]
+            if path.suffix == ".service":
+                places.remove(self.prefix)  # systemd wants the command's absolute path
+            for place in places:
                 self.assertNotIn(str(place).encode(), text, path.relative_to(bare))
 
     def test_each_header_compiles_alone(self) -> None:
@@ -144,15 +141,17 @@ class Files(Installed):
             dynamic = self.dynamic(self.prefix / LIBDIR / name)
             self.assertIn(f"Library soname: [{soname}]", dynamic)
 
-    def test_search_paths_are_only_for_prefixes_that_are_no_systems(self) -> None:
-        is_system = SYSTEM_PREFIX.fullmatch(PREFIX) is not None
-        for path in (self.prefix / LIBDIR / "libsecpolicy.so", self.prefix / "bin" / "secpolicy"):
+    def test_libraries_are_found_relative_to_what_needs_them(self) -> None:
+        for path, expected in ((self.prefix / LIBDIR / "libsecpolicy.so", "$ORIGIN"),
+                               (self.prefix / LIBDIR / "libsecpolicy_c.so", "$ORIGIN"),
+                               (self.prefix / "bin" / "secpolicy", f"$ORIGIN/../{LIBDIR}")):
             search = re.findall(r"\((?:RUNPATH|RPATH)\).*\[(.*)\]", self.dynamic(path))
-            if is_system:
-                self.assertEqual(search, [], path)
-            else:
-                self.assertEqual(len(search), 1, path)
-                self.assertTrue(search[0].startswith("$ORIGIN"), search)
+            self.assertEqual(search, [expected], path)
+
+    def test_the_unit_starts_the_command_of_its_prefix(self) -> None:
+        unit = (self.prefix / "lib/systemd/system/secpolicy-load.service").read_text()
+        self.assertIn(f"ExecStart={self.prefix}/bin/secpolicy load", unit)
+        self.assertNotIn("/usr/bin/secpolicy", unit)
 
     @staticmethod
     def dynamic(path: pathlib.Path) -> str:
@@ -240,7 +239,7 @@ class Consumer(Installed):
         flags = run("pkg-config", "--cflags", "--libs", *options, "secpolicy", **search).stdout
         program = self.place / "consumer"
         run(COMPILER, "-std=c++20", HERE / "consumer" / "consumer.cc", "-o", program,
-            *flags.split())
+            *flags.split(), f"-Wl,-rpath,{prefix / LIBDIR}")
         return program
 
     def test_by_cmake(self) -> None:
@@ -253,7 +252,19 @@ class Consumer(Installed):
 
     def test_by_pkg_config(self) -> None:
         moved = self.moved()
-        self.check(self.compile(moved), LD_LIBRARY_PATH=moved / LIBDIR)
+        self.check(self.compile(moved))
+
+    def test_the_c_interface_by_pkg_config(self) -> None:
+        library = self.moved() / LIBDIR
+        search = {"PKG_CONFIG_PATH": library / "pkgconfig"}
+        flags = run("pkg-config", "--cflags", "--libs", "secpolicy-c", **search).stdout
+        source = self.place / "version.c"
+        source.write_text("#include <secpolicy/secpolicy_c.h>\n#include <stdio.h>\n"
+                          "int main(void) { return printf(\"%u\\n\", (unsigned)secpolicy_c_version()) < 0; }\n")
+        program = self.place / "version"
+        run(cached("CMAKE_C_COMPILER"), source, "-o", program, *flags.split(),
+            f"-Wl,-rpath,{library}")
+        self.assertRegex(run(program).stdout, r"^[1-9][0-9]*\n$")
 
     def test_by_pkg_config_with_the_archives(self) -> None:
         moved = self.moved()
@@ -289,7 +300,7 @@ class Consumer(Installed):
         self.command("host", "assemble", host)
         shown = self.command("show", "--host", host).stdout
         for made in (build / "program", self.place / "program"):
-            self.assertEqual(run(made, host, **self.loader()).stdout, shown)
+            self.assertEqual(run(made, host).stdout, shown)
 
     def test_an_older_program_does_not_take_a_version_that_broke_something(self) -> None:
         project = self.place / "project"
