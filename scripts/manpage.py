@@ -16,6 +16,15 @@ def escaped(text):
     return re.sub(r"([\\_*<>|#~`])", r"\\\1", text)
 
 
+# What stands between fences is literal, but for backslashes, which scdoc would still interpret.
+LITERAL = re.compile(r"^```\n.*?^```$", re.MULTILINE | re.DOTALL)
+
+
+def literal(text):
+    """`text` with the backslashes of its literal blocks doubled."""
+    return LITERAL.sub(lambda block: block[0].replace("\\", "\\\\"), text)
+
+
 def split(text):
     """The first section of a text, and the others."""
     second = re.search(r"^# ", text[1:], re.MULTILINE)
@@ -29,7 +38,7 @@ def see_also(pages):
 
 def write_page(directory, name, section, body):
     """Typesets a page, without its preamble, into `directory`; ends the program when scdoc can't."""
-    source = f"{PLACEHOLDER}({section})\n\n{body}"
+    source = f"{PLACEHOLDER}({section})\n\n{literal(body)}"
     made = subprocess.run(["scdoc"], input=source.encode(), capture_output=True)
     if made.returncode != 0:
         sys.exit(f"{name}: {made.stderr.decode()}\n{source}")

@@ -19,7 +19,8 @@ json OptionsJson(const std::vector<CommandOption>& options) {
                        {"value", option.value},
                        {"choices", option.choices},
                        {"description", option.description},
-                       {"required", option.isRequired}});
+                       {"required", option.isRequired},
+                       {"repeatable", option.isRepeatable}});
   }
   return entries;
 }
