@@ -20,6 +20,9 @@ from ._library import version
 from ._results import (Answer, CheckReport, Decision, Domain, Finding, HeldPolicy, LoadMessage,
                        LoadResult, Match, Object, Place, Rule, Severity, Tardisk)
 
+#: The package's own version; version() is the library's.
+__version__ = "0.1.0"
+
 __all__ = [
     "Answer", "BadRequestError", "CheckReport", "Decision", "Domain", "Finding", "HeldPolicy",
     "Host", "HostError", "InvalidArgumentError", "LibraryError", "LoadError", "LoadMessage",

@@ -21,6 +21,11 @@ class Handle(Generic[Raw]):
         self._uses = 0
         self._is_closed = False
 
+    @property
+    def is_open(self) -> bool:
+        """Whether it has not been closed."""
+        return not self._is_closed
+
     @contextlib.contextmanager
     def use(self) -> Iterator[Raw]:
         """The handle, for a call. Raises ValueError when it was closed."""

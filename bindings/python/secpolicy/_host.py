@@ -72,6 +72,9 @@ class Host:
         _library.call("secpolicy_host_create", _path(directory, "directory"))
         return Host(directory)
 
+    def __repr__(self) -> str:
+        return f"secpolicy.Host({self.path!r})" if self._handle.is_open else "<closed secpolicy.Host>"
+
     @property
     def path(self) -> str:
         """The absolute path."""
@@ -138,7 +141,7 @@ class Host:
         name = _optional_path(source, "source")
         with self._handle.use() as host:
             _library.call("secpolicy_policy_read", host, name, ctypes.byref(raw))
-        return Policy(raw)
+        return Policy(raw, None if source is None else os.fspath(source))
 
     def close(self) -> None:
         """Frees the host. Policies that were read by way of it stay usable."""
@@ -158,29 +161,35 @@ class Policy:
     To be closed, or used in a "with" statement. May be used by several threads at once.
     """
 
-    def __init__(self, raw: PolicyHandle) -> None:
+    def __init__(self, raw: PolicyHandle, source: str | None) -> None:
         lib = _library.library()
+        self._source = source
         self._handle = Handle(raw, lib.secpolicy_policy_free, "policy")
         #: What a load of it reports, in order.
         self.errors: tuple[str, ...] = tuple(
             lib.secpolicy_policy_error(raw, index).decode()
             for index in range(lib.secpolicy_policy_error_count(raw)))
 
+    def __repr__(self) -> str:
+        state = f"{len(self.errors)} errors" if self._handle.is_open else "closed"
+        return f"<secpolicy.Policy of {self._source!r}, {state}>"
+
     def search(self, *, domain: str | None = None, type: str | None = None, word: str | None = None,
                pattern: str | None = None, path: str | None = None,
-               decision: Decision | None = None) -> tuple[Match, ...]:
+               decision: Decision | str | None = None) -> tuple[Match, ...]:
         """The rules for which everything holds that is given.
 
         Rules of this domain; of this type, "-s" or "syscall" for instance; with this word; with a
         word that this regular expression (ECMAScript) is found in; path rules that decide on this
-        absolute path or are for something below it; that decide so. A path rule grants when it
-        permits anything. Raises BadRequestError for an unknown domain or type, a bad pattern or a
-        relative path, and InvalidArgumentError for a word together with a pattern.
+        absolute path or are for something below it; that decide so, Decision.GRANT or "grant" for
+        instance. A path rule grants when it permits anything. Raises BadRequestError for an unknown
+        domain or type, a bad pattern or a relative path, and InvalidArgumentError for a word
+        together with a pattern and for an unknown decision.
         """
         terms = _library.SearchTerms(
             ctypes.sizeof(_library.SearchTerms), _optional(domain, "domain"),
             _optional(type, "type"), _optional(word, "word"), _optional(pattern, "pattern"),
-            _optional(path, "path"), _DECISIONS[decision])
+            _optional(path, "path"), _decision(decision))
         with self._handle.use() as raw:
             text = _library.text_from("secpolicy_search", raw, ctypes.byref(terms))
         return Match._all_of(json.loads(text)["matches"])
@@ -217,5 +226,14 @@ class Policy:
         self.close()
 
 
-_DECISIONS = {None: _library.ANY_DECISION, Decision.GRANT: _library.GRANTED,
-              Decision.REVOKE: _library.REVOKED}
+_DECISIONS = {Decision.GRANT: _library.GRANTED, Decision.REVOKE: _library.REVOKED}
+
+
+def _decision(decision: Decision | str | None) -> int:
+    if decision is None:
+        return _library.ANY_DECISION
+    try:
+        return _DECISIONS[Decision(decision)]
+    except ValueError:
+        known = ", ".join(repr(each.value) for each in Decision)
+        raise InvalidArgumentError(f"{decision!r} is no decision: {known}") from None

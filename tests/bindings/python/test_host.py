@@ -27,6 +27,13 @@ class LoadTest(HostTest):
         self.assertEqual(syscall.line, "-s open grant")
         self.assertEqual(syscall.place, secpolicy.Place(None, 1, None))
 
+    def test_its_representation_opens_it_again(self):
+        again = eval(repr(self.host))  # what Python's own types promise of theirs
+        self.addCleanup(again.close)
+        self.assertEqual(again.path, self.host.path)
+        again.close()
+        self.assertEqual(repr(again), "<closed secpolicy.Host>")
+
     def test_one_domain_is_shown(self):
         self.host.load(self.policy)
         self.assertEqual([each.name for each in self.host.show(1).domains], ["appDom"])

@@ -9,6 +9,7 @@ import sys
 import tomllib
 import unittest
 
+import secpolicy
 from secpolicy import _library
 
 HEADER = pathlib.Path(os.environ["SECPOLICY_HEADER"])
@@ -114,8 +115,10 @@ class DeclarationsTest(unittest.TestCase):
         root = TESTS.parent.parent
         project = re.search(r"^project\(\w+ VERSION ([\d.]+)", (root / "CMakeLists.txt").read_text(),
                             re.MULTILINE).group(1)
+        self.assertEqual(secpolicy.__version__, project)
         package = tomllib.loads((root / "bindings/python/pyproject.toml").read_text())
-        self.assertEqual(package["project"]["version"], project)
+        self.assertEqual(package["tool"]["setuptools"]["dynamic"]["version"],
+                         {"attr": "secpolicy.__version__"})
 
 
 class MissingLibraryTest(unittest.TestCase):

@@ -22,6 +22,7 @@ class PolicyTest(HostTest):
         self.assertEqual(self.lines(path="/etc/hosts"), ["-r /etc rw"])
         self.assertEqual(self.lines(type="-s", decision=secpolicy.Decision.REVOKE),
                          ["-s write revoke"])
+        self.assertEqual(self.lines(type="-s", decision="revoke"), ["-s write revoke"])
         self.assertEqual(self.lines(path="/usr"), [])
 
     def test_a_match_has_its_place(self):
@@ -41,6 +42,15 @@ class PolicyTest(HostTest):
             self.read.search(word="a", pattern="b")
         with self.assertRaises(secpolicy.InvalidArgumentError):
             self.read.search(word="a\0b")
+        with self.assertRaisesRegex(secpolicy.InvalidArgumentError,
+                                    "^'allow' is no decision: 'grant', 'revoke'$"):
+            self.read.search(decision="allow")
+
+    def test_its_representation_says_what_was_read(self):
+        self.assertEqual(repr(self.read), f"<secpolicy.Policy of {str(self.policy)!r}, 0 errors>")
+        with self.host.read_policy() as kernel:
+            self.assertEqual(repr(kernel), "<secpolicy.Policy of 'kernel', 0 errors>")
+        self.assertEqual(repr(kernel), "<secpolicy.Policy of 'kernel', closed>")
 
     def test_may(self):
         answer = self.read.may("appDom", "read", "/etc/hosts")
