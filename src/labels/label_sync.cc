@@ -1,5 +1,6 @@
 // Keeping the kernel's labels in step with the policy's.
-#include <algorithm>
+#include <string_view>
+#include <unordered_set>
 
 #include "core/diagnostics.h"
 
@@ -38,10 +39,11 @@ void SyncLabelsFromPolicy(std::vector<std::string> policyLabels,
 std::vector<std::string> GetObsoleteLabels(std::vector<std::string> policyLabels,
                                            std::map<std::string, long> existing,
                                            ZekAccessLabelType type, ZekAccessInterfaceImpl& iface) {
+  const std::unordered_set<std::string_view> wanted(policyLabels.begin(), policyLabels.end());
   std::vector<std::string> obsolete;
   for (const auto& [name, id] : existing) {
     if (type == kDomainLabel && iface.IsPrivilegedVm(name)) continue;
-    if (std::find(policyLabels.begin(), policyLabels.end(), name) != policyLabels.end()) continue;
+    if (wanted.contains(name)) continue;
     if (iface.IsPredefinedLabel(name, type)) continue;
     obsolete.push_back(name);
   }
