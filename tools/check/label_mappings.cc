@@ -1,6 +1,9 @@
 #include "tools/check/label_mappings.h"
 
+#include <string_view>
 #include <unordered_map>
+
+#include "tools/policy/path_tree.h"
 
 namespace SecPolicyTool {
 
@@ -16,7 +19,13 @@ std::string PlaceOf(const LabelMapping& mapping) {
 class LaterMappings {
  public:
   void Add(const LabelMapping& mapping) {
-    (mapping.isTree ? trees_ : files_).try_emplace(mapping.path, &mapping);
+    if (!mapping.isTree) {
+      files_.try_emplace(mapping.path, &mapping);
+      return;
+    }
+    trees_.Visit(mapping.path, [&](const LabelMapping*& last, std::string_view above) {
+      if (above.size() >= mapping.path.size() && last == nullptr) last = &mapping;
+    });
   }
 
   // One that labels all that `mapping` does; nullptr for none.
@@ -24,14 +33,15 @@ class LaterMappings {
     if (!mapping.isTree) {
       if (const auto same = files_.find(mapping.path); same != files_.end()) return same->second;
     }
-    for (std::string path = mapping.path;; path.resize(path.rfind('/'))) {
-      if (const auto above = trees_.find(path); above != trees_.end()) return above->second;
-      if (path.find('/') == std::string::npos) return nullptr;
-    }
+    const LabelMapping* innermost = nullptr;
+    trees_.VisitKnown(mapping.path, [&](const LabelMapping* tree, std::string_view) {
+      if (tree != nullptr) innermost = tree;
+    });
+    return innermost;
   }
 
  private:
-  std::unordered_map<std::string, const LabelMapping*> trees_;
+  PathTree<const LabelMapping*> trees_;
   std::unordered_map<std::string, const LabelMapping*> files_;
 };
 

@@ -1,9 +1,10 @@
 #include "tools/query/label_folding.h"
 
 #include <map>
+#include <string_view>
 #include <unordered_map>
 
-#include "tools/query/paths.h"
+#include "tools/policy/path_tree.h"
 
 namespace SecPolicyTool {
 
@@ -16,10 +17,12 @@ struct Tree {
   const ChangedLabel* first = nullptr;
   bool isAlike = true;  // what has changed has changed like `first`
 
+  // Adds a file and its change, which is nullptr for one that has not changed.
+  void Add(const ChangedLabel* change);
   [[nodiscard]] bool IsFolded() const { return files > 1 && changed == files && isAlike; }
 };
 
-using Trees = std::unordered_map<std::string, Tree>;
+using Trees = PathTree<Tree>;
 using MaybeLabel = std::optional<std::string>;
 
 MaybeLabel LabelOf(const std::optional<LabelledFile>& file) {
@@ -31,30 +34,37 @@ bool IsAlike(const ChangedLabel& one, const ChangedLabel& other) {
          LabelOf(one.change.after) == LabelOf(other.change.after);
 }
 
+void Tree::Add(const ChangedLabel* change) {
+  ++files;
+  if (change == nullptr) return;
+  ++changed;
+  if (first == nullptr) first = change;
+  isAlike = isAlike && IsAlike(*first, *change);
+}
+
 Trees TreesOf(const std::vector<ChangedLabel>& changes, const std::vector<std::string>& all) {
   std::map<std::string, const ChangedLabel*> byPath;
   for (const std::string& path : all) byPath[path] = nullptr;
   for (const ChangedLabel& change : changes) byPath[change.name] = &change;
   Trees trees;
   for (const auto& [path, change] : byPath) {
-    for (const std::string& above : WithParents(path)) {
-      Tree& tree = trees[above];
-      ++tree.files;
-      if (change == nullptr) continue;
-      ++tree.changed;
-      if (tree.first == nullptr) tree.first = change;
-      tree.isAlike = tree.isAlike && IsAlike(*tree.first, *change);
-    }
+    trees.Visit(path, [&, each = change](Tree& tree, std::string_view) { tree.Add(each); });
   }
   return trees;
 }
 
-// The outermost tree to say `path`'s change with; `path` when it stands alone.
-std::string OutermostTree(const std::string& path, const Trees& trees) {
-  for (const std::string& above : WithParents(path)) {
-    if (trees.at(above).IsFolded()) return above;
-  }
-  return path;
+// The outermost tree to say `path`'s change with; nullptr when the change stands alone.
+struct OutermostTree {
+  std::string path;
+  const Tree* tree = nullptr;
+};
+
+OutermostTree OutermostTreeOf(const std::string& path, const Trees& trees) {
+  OutermostTree outermost{path};
+  trees.VisitKnown(path, [&](const Tree& tree, std::string_view above) {
+    if (outermost.tree == nullptr && tree.IsFolded()) outermost = {std::string(above), &tree};
+  });
+  return outermost;
 }
 
 void KeepCommonPlace(std::optional<LabelledFile>& common, const std::optional<LabelledFile>& file) {
@@ -69,12 +79,11 @@ std::vector<FoldedLabel> FoldLabels(const std::vector<ChangedLabel>& changes,
   std::vector<FoldedLabel> folded;
   std::unordered_map<std::string, std::size_t> indices;
   for (const ChangedLabel& each : changes) {
-    const std::string top = OutermostTree(each.name, trees);
+    const auto [top, tree] = OutermostTreeOf(each.name, trees);
     const auto [index, isNew] = indices.emplace(top, folded.size());
     if (isNew) {
-      const Tree& tree = trees.at(top);
       const std::string pattern = top == "/" ? "/*" : top + "/*";
-      folded.push_back({tree.IsFolded() ? pattern : top, tree.IsFolded() ? tree.files : 1, each});
+      folded.push_back({tree ? pattern : top, tree ? tree->files : 1, each});
     } else {
       KeepCommonPlace(folded[index->second].change.change.before, each.change.before);
       KeepCommonPlace(folded[index->second].change.change.after, each.change.after);
