@@ -1,11 +1,15 @@
 // The verbs over the labels of files.
+#include <sys/resource.h>
+
 #include "tests/tools/group_fixture.h"
 #include "tests/tools/schema.h"
 
 namespace SecPolicyTool {
 namespace {
 
+using testing::ElementsAre;
 using testing::HasSubstr;
+using testing::StartsWith;
 
 class LabelTest : public GroupTest {
  protected:
@@ -14,7 +18,7 @@ class LabelTest : public GroupTest {
   void SetUp() override {
     StandIn::Archive base;
     base.Directory("etc").File("etc/hosts", "").File("etc/motd", "").Directory("etc/net");
-    base.File("etc/net/conf", "").Symlink("etc/link", "motd").Fifo("etc/pipe");
+    base.File("etc/net/conf", "").Symlink("etc/link", "motd").Fifo("etc/pipe").Symlink("up", "etc");
     MakeHost({{"base.tar", base}});
     Policy("objects/base", "conf\nnetConf\n");
     ASSERT_EQ(Load().status, 0);
@@ -118,6 +122,78 @@ TEST_F(LabelTest, JsonIsAsDescribed) {
   EXPECT_EQ(result.status, 1);
   EXPECT_EQ(JsonProblem(result.out, "label-verify"), "") << result.out;
   EXPECT_THAT(result.out, HasSubstr("\"expected\": \"conf\""));
+}
+
+TEST_F(LabelTest, TreeBelowALinkIsVerifiedByItsOwnPath) {
+  Policy("fileLabels/base", "/etc/net/* conf\n");
+  ASSERT_EQ(Load().status, 0);
+  Out({"set", "/etc/net/conf", "netConf"});
+  for (const std::string path : {"/up/net", "/up/net/", "/up", "/up/", "/"}) {
+    const Result result = Use({"verify", "-R", "--policy", PolicyDir(), path});
+    EXPECT_EQ(result.status, 1) << path;
+    EXPECT_THAT(result.out, HasSubstr("net/conf: netConf, not conf (")) << path;
+  }
+}
+
+// More levels of directories than files may be open.
+class DeepTreeTest : public CommandTest {
+ protected:
+  static constexpr rlim_t kOpenFiles = 64;
+  static constexpr int kLevels = 100;
+
+  void SetUp() override {
+    StandIn::Archive base;
+    std::string path = "deep";
+    for (int level = 0; level < kLevels; ++level, path += "/d") base.Directory(path);
+    MakeHost({{"base.tar", base}});
+    Policy("objects/base", "conf\n");
+    ASSERT_EQ(Load().status, 0);
+  }
+
+  Result WithFewFiles(const Arguments& arguments) const {
+    return Command(arguments, [] {
+      const rlimit limit{kOpenFiles, kOpenFiles};
+      setrlimit(RLIMIT_NOFILE, &limit);
+    });
+  }
+};
+
+const char kTooManyOpenFiles[] =
+    "labelling a tree keeps a directory open for each of its levels, and the limit of open files "
+    "is 64; raise it (ulimit -n)";
+
+TEST_F(DeepTreeTest, LimitOfOpenFilesIsNamedWhereItEndsTheLabelling) {
+  const Result result = WithFewFiles({"label", "set", "--host", Host(), "-R", "/deep", "conf"});
+  EXPECT_EQ(result.status, 1);
+  EXPECT_THAT(result.Errors(),
+              ElementsAre(StartsWith("Error: Unable to open directory /deep/d/d/d/"),
+                          std::string("Error: ") + kTooManyOpenFiles));
+}
+
+TEST_F(DeepTreeTest, LimitOfOpenFilesIsNamedOnceByALoad) {
+  Policy("fileLabels/base", "/deep/* conf\n/deep/d/* conf\n");
+  const Result result = WithFewFiles({"load", "--host", Host(), PolicyDir()});
+  EXPECT_EQ(result.status, 1);
+  std::vector<std::string> errors = result.Errors();
+  std::erase_if(errors, [](const std::string& line) { return !line.starts_with("Error: "); });
+  ASSERT_GE(errors.size(), 3U);
+  EXPECT_THAT(errors[0], HasSubstr("/fileLabels/base:1 : Unable to open directory /deep/d/"));
+  EXPECT_EQ(errors[1], std::string("Error: ") + kTooManyOpenFiles);
+  EXPECT_THAT(errors[2], HasSubstr("/fileLabels/base:2 : Unable to open directory /deep/d/"));
+  EXPECT_EQ(std::count(errors.begin(), errors.end(), errors[1]), 1);
+}
+
+TEST_F(DeepTreeTest, LimitOfOpenFilesIsTheHelpOfACheck) {
+  Policy("fileLabels/base", "/deep/* conf\n");
+  const Result result = WithFewFiles({"check", "--host", Host(), PolicyDir()});
+  EXPECT_EQ(result.status, 1);
+  EXPECT_THAT(result.out, HasSubstr(std::string("help: ") + kTooManyOpenFiles + "\n"));
+}
+
+TEST_F(DeepTreeTest, LimitOfOpenFilesIsNotBlamedForAFile) {
+  const Result result =
+      WithFewFiles({"label", "set", "--host", Host(), "-R", "/tardisks/base.tar", "conf"});
+  EXPECT_THAT(result.Errors(), ElementsAre("Error: Unable to open directory /tardisks/base.tar"));
 }
 
 }  // namespace

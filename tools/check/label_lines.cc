@@ -8,6 +8,7 @@
 
 #include "secpolicy/secpolicy.h"
 #include "tools/check/label_mappings.h"
+#include "tools/labels/descriptor_limit.h"
 
 namespace SecPolicyTool {
 
@@ -134,8 +135,10 @@ bool LabelFile::Applies(const PolicyLine& line, const std::string& path, bool is
   }
   if (cause.empty()) return true;
   const Trouble& trouble = TroubleOf(line.words[0].text, cause);
+  const std::string reason = DescriptorLimitReason(cause, OpensDirectory);
   context_.findings.AddError(trouble.kind, SpotOf(file_, line, line.words[0]), cause,
-                             AtLine(file_.path, line.number, cause), trouble.help);
+                             AtLine(file_.path, line.number, cause),
+                             reason.empty() ? trouble.help : reason);
   return false;
 }
 

@@ -5,6 +5,7 @@
 #include <sys/syscall.h>
 #include <unistd.h>
 
+#include <cstdint>
 #include <filesystem>
 
 #include "tools/policy/held_policy.h"
@@ -19,9 +20,9 @@ namespace {
 namespace fs = std::filesystem;
 
 // Opens `path` as if `rootFd` were the root directory.
-UniqueFd OpenInRoot(int rootFd, const std::string& path) {
+UniqueFd OpenInRoot(int rootFd, const std::string& path, std::uint64_t flags) {
   struct open_how how {};
-  how.flags = O_PATH | O_CLOEXEC;
+  how.flags = flags | O_CLOEXEC;
   how.resolve = RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS;
   // The C library has no function for this call.
   return UniqueFd(static_cast<int>(::syscall(SYS_openat2, rootFd, path.c_str(), &how, sizeof how)));
@@ -40,13 +41,17 @@ HostPaths::HostPaths(const HostDirectory& host)
                    O_PATH | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC)) {}
 
 std::string HostPaths::Resolve(const std::string& path) const {
-  const UniqueFd file = OpenInRoot(root_.Get(), path);
+  const UniqueFd file = OpenInRoot(root_.Get(), path, O_PATH);
   if (file.Get() < 0) return path;
   const std::string root = PathOf(root_);
   const std::string found = PathOf(file);
   if (root.empty() || !found.starts_with(root)) return path;
   const std::string inside = found.substr(root.size());
   return inside.empty() ? "/" : inside;
+}
+
+bool HostPaths::OpensDirectory(const std::string& path) const {
+  return OpenInRoot(root_.Get(), path, O_RDONLY | O_DIRECTORY).Get() >= 0;
 }
 
 std::vector<std::string> LabelablePaths(const HostDirectory& host) {

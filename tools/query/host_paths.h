@@ -19,6 +19,9 @@ class HostPaths {
   // system. A path that does not lead to a file stays as it is: so does that of a rule.
   [[nodiscard]] std::string Resolve(const std::string& path) const;
 
+  // Whether `path` leads to a directory that this process can open now.
+  [[nodiscard]] bool OpensDirectory(const std::string& path) const;
+
  private:
   StandIn::UniqueFd root_;
 };

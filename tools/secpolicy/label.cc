@@ -7,6 +7,7 @@
 #include <stdexcept>
 
 #include "secpolicy/secpolicy.h"
+#include "tools/labels/descriptor_limit.h"
 #include "tools/labels/label_tree.h"
 #include "tools/policy/label_lines.h"
 #include "tools/policy/output.h"
@@ -104,11 +105,20 @@ void SetLabels(const LabelArguments& arguments) {
   }
 }
 
+// `path`, which is `dir` or lies below it, by way of `resolved` in place of `dir`.
+std::string Below(const std::string& resolved, const std::string& dir, const std::string& path) {
+  std::string below = path.substr(dir.size());
+  if (!below.empty() && !below.starts_with('/') && !resolved.ends_with('/')) below.insert(0, "/");
+  return resolved + below;
+}
+
 // Compares the files' labels with those that the policy gives them.
 void Verify(const LabelArguments& arguments, const PolicyFiles& files, Results& results) {
   const LabelLines lines(files);
+  // Links are looked for once: there are none between a tree's root and its files.
+  const std::string root = WithoutLinks(arguments.path);
   ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
-    const LabelLine* line = lines.LineFor(WithoutLinks(path));
+    const LabelLine* line = lines.LineFor(Below(root, arguments.path, path));
     if (line == nullptr || line->label == label) return;
     results.status = kFailed;
     if (arguments.isJson) {
@@ -148,6 +158,8 @@ ExitStatus RunSet(const LabelArguments& arguments) {
     SetLabels(arguments);
   } catch (const std::exception& failure) {
     results.Fail(failure.what());
+    const std::string reason = DescriptorLimitReason(failure.what(), OpensDirectory);
+    if (!reason.empty()) results.Fail(reason);
   }
   // What was set before a failure stays set.
   session->Commit();

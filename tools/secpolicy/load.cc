@@ -9,11 +9,13 @@
 #include <stdexcept>
 
 #include "host/image/session.h"
+#include "tools/labels/descriptor_limit.h"
 #include "tools/policy/child_process.h"
 #include "tools/policy/output.h"
 #include "tools/policy/policy_path.h"
 #include "tools/policy/progress.h"
 #include "tools/policy/progress_filter.h"
+#include "tools/query/host_paths.h"
 #include "tools/requests/batch_load.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/source_option.h"
@@ -81,13 +83,19 @@ std::string WhatTheKernelHolds(bool isWritten) {
 
 ExitStatus Load(const LoadArguments& arguments) {
   StandIn::HostDirectory host = OpenHost(arguments.host);
+  const HostPaths paths(host);
   const StandIn::StateFile state(host);
   const StandIn::StateFile::Version before = state.CurrentVersion();
   Progress progress("Loading");
-  const auto show = [&](std::string& line) {
+  const auto show = [&, isReasonShown = false](std::string& line) mutable {
     if (!FilterProgress(line)) return;
     progress.Clear();
     std::cerr << line + "\n";
+    if (isReasonShown) return;
+    const std::string reason = DescriptorLimitReason(
+        line, [&](const std::string& dir) { return paths.OpensDirectory(dir); });
+    isReasonShown = !reason.empty();
+    if (isReasonShown) ReportError(reason);
   };
   const int status = RunInChild([&] { return LoadIn(std::move(host), arguments); }, show,
                                 [&] { progress.Tick(); });
