@@ -115,7 +115,7 @@ CheckReport CheckWholePolicy(HostDirectory host, const std::string& dir) {
         errors.End();
         return CheckAfter(errors.Errors(), place, image, session.Module());
       });
-  return {FindingsOfJson(std::move(outcome.result.at(1))), outcome.result.at(0)};
+  return {FindingsOfJson(outcome.result.at(1)), outcome.result.at(0)};
 }
 
 std::vector<Finding> CheckPolicy(HostDirectory host, const std::string& dir) {

@@ -1,5 +1,5 @@
-// Findings as JSON, to be carried from one process to another. Its strings hold the bytes as they
-// are.
+// Findings as JSON, to be carried from one process to another on the same machine; not for anyone
+// to read. Texts keep their bytes as they are.
 #pragma once
 
 #include <nlohmann/json_fwd.hpp>
@@ -9,9 +9,9 @@
 
 namespace SecPolicyTool {
 
-nlohmann::json ToJson(std::vector<Finding> findings);
+nlohmann::json ToJson(const std::vector<Finding>& findings);
 
 // The findings that ToJson made these of.
-std::vector<Finding> FindingsOfJson(nlohmann::json entries);
+std::vector<Finding> FindingsOfJson(const nlohmann::json& content);
 
 }  // namespace SecPolicyTool

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <utility>
 
 #include "tools/report/sections.h"
 
@@ -36,7 +37,7 @@ Html FindingsSection(const ReportContext& context) {
   for (const Finding& finding : *context.report.findings) entries += FindingEntry(finding);
   return Section("findings", "Findings",
                  entries.IsEmpty() ? Element("p", "A check of its files finds nothing.")
-                                   : Element("ul", {{"class", "list"}}, entries));
+                                   : Element("ul", {{"class", "list"}}, std::move(entries)));
 }
 
 }  // namespace SecPolicyTool

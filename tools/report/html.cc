@@ -59,14 +59,14 @@ Html& Html::operator+=(const Html& next) {
 
 Html operator+(Html first, const Html& second) { return std::move(first += second); }
 
-Html Element(const char* tag, const std::vector<Attribute>& attributes, const Html& content) {
-  std::string markup = StartTag(tag, attributes);
-  markup += content.Markup();
-  markup += std::string("</") + tag + ">";
-  return Html::TrustedMarkup(std::move(markup));
+// The content may be most of a page: it is put between its tags in place, and not copied.
+Html Element(const char* tag, const std::vector<Attribute>& attributes, Html content) {
+  content.markup_.insert(0, StartTag(tag, attributes));
+  content.markup_ += std::string("</") + tag + ">";
+  return content;
 }
 
-Html Element(const char* tag, const Html& content) { return Element(tag, {}, content); }
+Html Element(const char* tag, Html content) { return Element(tag, {}, std::move(content)); }
 
 Html VoidElement(const char* tag, const std::vector<Attribute>& attributes) {
   return Html::TrustedMarkup(StartTag(tag, attributes));

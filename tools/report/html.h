@@ -27,14 +27,16 @@ class Html {
   [[nodiscard]] const std::string& Markup() const { return markup_; }
 
  private:
+  friend Html Element(const char* tag, const std::vector<Attribute>& attributes, Html content);
+
   std::string markup_;
 };
 
 Html operator+(Html first, const Html& second);
 
 // An element with its content.
-Html Element(const char* tag, const std::vector<Attribute>& attributes, const Html& content);
-Html Element(const char* tag, const Html& content);
+Html Element(const char* tag, const std::vector<Attribute>& attributes, Html content);
+Html Element(const char* tag, Html content);
 // An element that has no content and no end.
 Html VoidElement(const char* tag, const std::vector<Attribute>& attributes);
 

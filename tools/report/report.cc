@@ -4,6 +4,7 @@
 
 #include <array>
 #include <stdexcept>
+#include <utility>
 
 #include "tools/report/html.h"
 #include "tools/report/report_assets.h"
@@ -73,13 +74,14 @@ Html SearchBox() {
 Html Body(const ReportContext& context) {
   const Html bar = Element("div", {{"class", "bar"}},
                            Element("div", {{"class", "wide"}}, SearchBox() + Navigation(context)));
-  const Html sections = GraphSection(context) + DomainsSection(context) + LabelsSection(context) +
-                        FilesSection(context) + TardisksSection(context);
-  return Element("body",
-                 bar +
-                     Element("main", {{"class", "wide"}},
-                             OverviewSection(context) + FindingsSection(context) + sections) +
-                     Element("script", Html::TrustedMarkup(kReportJs)));
+  // In the order of the navigation; each is gone once it is a part of the page.
+  Html sections = OverviewSection(context);
+  for (const auto section : {FindingsSection, GraphSection, DomainsSection, LabelsSection,
+                             FilesSection, TardisksSection}) {
+    sections += section(context);
+  }
+  return Element("body", bar + Element("main", {{"class", "wide"}}, std::move(sections)) +
+                             Element("script", Html::TrustedMarkup(kReportJs)));
 }
 
 }  // namespace

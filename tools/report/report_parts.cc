@@ -1,5 +1,7 @@
 #include "tools/report/report_parts.h"
 
+#include <utility>
+
 namespace SecPolicyTool {
 
 namespace {
@@ -69,10 +71,12 @@ std::string Counted(std::size_t count, const std::string& what) {
   return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
 }
 
-Html Section(const char* id, const std::string& title, const Html& content) {
+Html Section(const char* id, const std::string& title, Html content) {
   const std::string heading = std::string(id) + "-title";
-  return Element("section", {{"id", id}, {"aria-labelledby", heading}},
-                 Element("h2", {{"id", heading}}, title) + content);
+  Html whole = Element("h2", {{"id", heading}}, title);
+  whole += content;
+  content = {};
+  return Element("section", {{"id", id}, {"aria-labelledby", heading}}, std::move(whole));
 }
 
 Html Entry(const std::string& id, const Html& summary, const Html& content) {

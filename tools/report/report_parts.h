@@ -45,7 +45,7 @@ Html PlaceHtml(const std::optional<Place>& place, const std::string& file = "");
 std::string Counted(std::size_t count, const std::string& what);
 
 // A section with a heading and what it holds.
-Html Section(const char* id, const std::string& title, const Html& content);
+Html Section(const char* id, const std::string& title, Html content);
 
 // A collapsed entry of a section that is found by searching, and opened by a link to its id.
 Html Entry(const std::string& id, const Html& summary, const Html& content);
