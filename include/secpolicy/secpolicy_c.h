@@ -206,8 +206,9 @@ typedef struct secpolicy_search_terms {
   const char* domain;          /* rules of this domain; NULL for all */
   const char* type;            /* "-s" or "syscall", for instance; NULL for all */
   const char* word;            /* rules with this word; NULL for all */
-  const char* pattern;         /* rules with a word that this regular expression (ECMAScript) is
-                                  found in; NULL for all. Not together with `word`. */
+  const char* pattern;         /* rules with a word that this regular expression (RE2 syntax, at
+                                  most 1,000 bytes) is found in; NULL for all. Not together with
+                                  `word`. */
   const char* path;            /* an absolute path of the host: path rules that decide on it, or are
                                   for something below it; NULL for all */
   secpolicy_decision decision; /* rules that decide so */

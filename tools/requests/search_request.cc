@@ -1,7 +1,9 @@
 #include "tools/requests/search_request.h"
 
+#include <re2/re2.h>
+
+#include <memory>
 #include <nlohmann/json.hpp>
-#include <regex>
 
 #include "tools/policy/terminal.h"
 #include "tools/query/bad_request.h"
@@ -15,10 +17,24 @@ using nlohmann::json;
 
 namespace {
 
-std::regex RegexOf(const std::string& text) try {
-  return std::regex(text, std::regex::ECMAScript);
-} catch (const std::regex_error& problem) {
-  throw BadRequest("\"" + Printable(text) + "\" is no regular expression: " + problem.what());
+// Bounds of what a pattern may take; a match takes time in proportion to the word's length.
+constexpr std::size_t kLongestPattern = 1000;     // bytes
+constexpr std::int64_t kPatternMemory = 4 << 20;  // bytes, for all that is made of it
+
+// RE2 cannot be copied, and functions are.
+std::shared_ptr<const RE2> RegexOf(const std::string& text) {
+  if (text.size() > kLongestPattern) {
+    throw BadRequest("the regular expression has " + std::to_string(text.size()) +
+                     " bytes, and at most " + std::to_string(kLongestPattern) + " are allowed");
+  }
+  RE2::Options options(RE2::Quiet);
+  options.set_max_mem(kPatternMemory);
+  auto regex = std::make_shared<const RE2>(text, options);
+  if (!regex->ok()) {
+    throw BadRequest("\"" + Printable(text) +
+                     "\" is no regular expression: " + Printable(regex->error()));
+  }
+  return regex;
 }
 
 std::function<bool(const std::string&)> WordTerm(const SearchRequest& request) {
@@ -27,7 +43,7 @@ std::function<bool(const std::string&)> WordTerm(const SearchRequest& request) {
     return [wanted = *request.word](const std::string& word) { return word == wanted; };
   }
   return [regex = RegexOf(*request.word)](const std::string& word) {
-    return std::regex_search(word, regex);
+    return RE2::PartialMatch(word, *regex);
   };
 }
 

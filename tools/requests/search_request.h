@@ -17,6 +17,7 @@ struct SearchRequest {
   std::optional<std::string> domain;
   std::optional<std::string> type;  // see TypeNamed
   std::optional<std::string> word;
+  // kRegex: a word that holds a match of this regular expression, in the syntax of RE2.
   enum class Word : std::uint8_t { kExact, kRegex } wordIs = Word::kExact;
   std::optional<std::string> path;  // within the host; its links are followed
   std::optional<bool> isGranted;
@@ -27,7 +28,8 @@ std::string TypeProblem(const std::string& name);
 std::string PathProblem(const std::string& path);
 
 // The terms that `request` means on a host with these paths. Throws BadRequest: TypeProblem,
-// PathProblem, and `"WORD" is no regular expression: REASON`.
+// PathProblem, `"WORD" is no regular expression: REASON`, also for one that would take more than
+// 4 MiB, and "the regular expression has N bytes, and at most 1000 are allowed".
 SearchTerms TermsOf(const SearchRequest& request, const HostPaths& paths);
 
 // The rules of `policy` that `request` is for; they live as long as the policy. Throws as TermsOf

@@ -76,7 +76,7 @@ CommandLine SearchVerb() {
                    .description = "Rules with this word",
                    .store = Into(request.word)},
                   {.names = {"--regex"},
-                   .description = "The word is a regular expression (ECMAScript)",
+                   .description = "The word is a regular expression (RE2 syntax)",
                    .store = Into(arguments->isRegex),
                    .needs = "--word"},
                   {.names = {"--path"},

@@ -180,7 +180,7 @@ class Policy:
         """The rules for which everything holds that is given.
 
         Rules of this domain; of this type, "-s" or "syscall" for instance; with this word; with a
-        word that this regular expression (ECMAScript) is found in; path rules that decide on this
+        word that this regular expression (RE2 syntax) is found in; path rules that decide on this
         absolute path or are for something below it; that decide so, Decision.GRANT or "grant" for
         instance. A path rule grants when it permits anything. Raises BadRequestError for an unknown
         domain or type, a bad pattern or a relative path, and InvalidArgumentError for a word

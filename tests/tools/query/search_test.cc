@@ -94,7 +94,13 @@ TEST_F(SearchTest, WrongUsageIsNamed) {
   };
   for (const Row& row : {
            Row{{"--type", "-q"}, "--type: no type of rules is called \"-q\"\n"},
-           Row{{"--word", "(", "--regex"}, "--word: \"(\" is no regular expression: "},
+           Row{{"--word", "(", "--regex"}, "--word: \"(\" is no regular expression: missing ): ("},
+           Row{{"--word", "(a)\\1", "--regex"},
+               "--word: \"(a)\\1\" is no regular expression: invalid escape sequence: \\1"},
+           Row{{"--word", "\xff", "--regex"},
+               "--word: \"\\xff\" is no regular expression: invalid UTF-8"},
+           Row{{"--word", "((a{200}){200}){200}", "--regex"},
+               "--word: \"((a{200}){200}){200}\" is no regular expression: "},
            Row{{"--type", "\x1b[2J"}, "--type: no type of rules is called \"\\x1b[2J\"\n"},
            Row{{"--regex"}, "--regex requires --word\n"},
            Row{{"--path", "etc"}, "--path: not an absolute path: \"etc\"\n"},
@@ -107,6 +113,28 @@ TEST_F(SearchTest, WrongUsageIsNamed) {
     EXPECT_EQ(result.out, "") << row.error;
     EXPECT_THAT(result.err, StartsWith(row.error));
   }
+}
+
+TEST_F(SearchTest, RegularExpressionIsBounded) {
+  for (const std::string& pattern :
+       {std::string(60000, '('), std::string(60000, '(') + std::string(60000, ')'),
+        std::string(100000, 'a'), std::string(1001, 'a')}) {
+    const Result result = Verb("search", {PolicyDir(), "--word", pattern, "--regex"});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(result.out, "");
+    EXPECT_EQ(result.err, "--word: the regular expression has " + std::to_string(pattern.size()) +
+                              " bytes, and at most 1000 are allowed\n"
+                              "Run with --help for more information.\n");
+  }
+  EXPECT_EQ(Verb("search", {PolicyDir(), "--word", std::string(1000, 'a'), "--regex"}).status, 1);
+  const std::string nested = std::string(499, '(') + "op" + std::string(499, ')');
+  EXPECT_EQ(Verb("search", {PolicyDir(), "--word", nested, "--regex"}).status, 0);
+}
+
+// An engine that backtracks would take years for it.
+TEST_F(SearchTest, MatchIsTriedInTimeInProportionToTheWord) {
+  Policy("domains/netDom", "-p net_admin " + std::string(900, 'a') + " grant\n");
+  EXPECT_EQ(Found({"--word", "^(a*)*(a*)*(a*)*b$", "--regex"}), "");
 }
 
 TEST_F(SearchTest, JsonIsAsDescribed) {
