@@ -30,12 +30,31 @@ constexpr OrdinaryCall kOrdinaryCalls[] = {
     {SYS_getxattr, "getxattr", Door::kGetAttribute, 0},
 };
 
+long StatusOf(FaultKind kind) {
+  switch (kind) {
+    case FaultKind::kTooSmall:
+      return ZekCtl::Kernel::kStatusTableTooSmall;
+    case FaultKind::kStatusOne:
+      return 1;
+    case FaultKind::kBareStatus:
+      return 0x0bad0000;
+    case FaultKind::kWideStatus:
+      return 1L << 32;
+    case FaultKind::kNegativeStatus:
+      return -4096;
+    case FaultKind::kOrdinaryStatus:
+      return -ENOSYS;
+    default:
+      return 0x0bad0005;
+  }
+}
+
 void Refuse(StandIn::TrappedCall& call, Door door) {
   if (door != Door::kPrivateCall) return call.SetResult(-EIO);
-  constexpr long kOtherStatus = 0x0bad0005;
   const FaultKind kind = KindOfFault();
-  call.SetResult(kind == FaultKind::kTooSmall ? ZekCtl::Kernel::kStatusTableTooSmall
-                                              : kOtherStatus);
+  call.SetResult(StatusOf(kind));
+  // An ordinary kernel leaves the second register as it is.
+  if (kind == FaultKind::kOrdinaryStatus) return;
   call.SetSecondResult(kind == FaultKind::kSilentCall ? 0 : -EIO);
 }
 

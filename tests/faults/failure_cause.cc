@@ -12,6 +12,8 @@ std::string ReasonOf(const Fault& fault) {
   switch (fault.kind) {
     case FaultKind::kSilentCall:
       return "{any}";  // of an error that was before
+    case FaultKind::kOrdinaryStatus:
+      return std::strerror(ENOSYS);
     case FaultKind::kOutOfMemory:
     case FaultKind::kAllocation:
       return std::strerror(ENOMEM);

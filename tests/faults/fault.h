@@ -33,6 +33,11 @@ enum class FaultKind : std::uint8_t {
   kCall,
   kSilentCall,
   kTooSmall,
+  kStatusOne,
+  kBareStatus,
+  kWideStatus,
+  kNegativeStatus,
+  kOrdinaryStatus,
   kResolvePath,
   kSetAttribute,
   kGetAttribute,
@@ -52,12 +57,18 @@ struct FaultInfo {
 };
 
 // By FaultKind.
-inline constexpr std::array<FaultInfo, 16> kFaults{{
+inline constexpr std::array<FaultInfo, 21> kFaults{{
     {"refusal", Door::kOperation},           // of the module, with a text
     {"out-of-memory", Door::kOperation},     // the access library throws std::bad_alloc
     {"call", Door::kPrivateCall},            // fails with an error value
     {"silent-call", Door::kPrivateCall},     // fails without one
     {"too-small-call", Door::kPrivateCall},  // fails with the status of a table that is too small
+    // Any status but 0 is a failure: each of these would pass for success under some wrong test.
+    {"status-1-call", Door::kPrivateCall},         // 1
+    {"bare-status-call", Door::kPrivateCall},      // the kernel's range of statuses, no number
+    {"wide-status-call", Door::kPrivateCall},      // 0 in its lower 32 bits
+    {"negative-status-call", Door::kPrivateCall},  // below what an ordinary kernel answers
+    {"ordinary-call", Door::kPrivateCall},         // a kernel that does not know the call
     {"resolve-path", Door::kResolvePath},
     {"set-attribute", Door::kSetAttribute},
     {"get-attribute", Door::kGetAttribute},

@@ -9,7 +9,7 @@ namespace {
 
 void PrintCell(const std::string& scenario, std::size_t fault, const Cell& cell) {
   if (cell.score.injected == 0 && cell.score.unexplained == 0) return;
-  std::cout << std::left << std::setw(28) << scenario << std::setw(16) << kFaults.at(fault).name
+  std::cout << std::left << std::setw(28) << scenario << std::setw(22) << kFaults.at(fault).name
             << std::right << std::setw(9) << cell.possible << std::setw(8) << cell.stride
             << std::setw(10) << cell.score.injected << std::setw(13) << cell.score.unexplained
             << "\n";
@@ -19,7 +19,7 @@ void PrintCell(const std::string& scenario, std::size_t fault, const Cell& cell)
 
 Score PrintScore(const std::vector<Scenario>& scenarios, const Scoreboard& board) {
   Score total;
-  std::cout << std::left << std::setw(28) << "scenario" << std::setw(16) << "fault" << std::right
+  std::cout << std::left << std::setw(28) << "scenario" << std::setw(22) << "fault" << std::right
             << std::setw(9) << "possible" << std::setw(8) << "stride" << std::setw(10) << "injected"
             << std::setw(13) << "unexplained"
             << "\n";

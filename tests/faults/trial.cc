@@ -3,6 +3,7 @@
 #include <memory>
 
 #include "tests/faults/check.h"
+#include "tests/faults/label_sync_order.h"
 
 namespace SecPolicyFaults {
 
@@ -13,6 +14,12 @@ void Append(const std::vector<std::string>& from, std::vector<std::string>& to) 
 }
 
 }  // namespace
+
+std::vector<std::string> Trial::UndisturbedFindings() const {
+  std::vector<std::string> findings = baseline_.run.findings;
+  Append(WrongLabelCalls(baseline_.run), findings);
+  return findings;
+}
 
 std::vector<std::string> Trial::Try(const Fault& fault, bool repeat) {
   const bool mayTerminate = MayTerminate(scenario_, baseline_, fault);

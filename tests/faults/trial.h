@@ -20,9 +20,7 @@ class Trial {
   }
 
   // What is wrong with the undisturbed run.
-  [[nodiscard]] const std::vector<std::string>& UndisturbedFindings() const {
-    return baseline_.run.findings;
-  }
+  [[nodiscard]] std::vector<std::string> UndisturbedFindings() const;
 
   // Runs the scenario with the fault; what is not as it is due. With `repeat`, it is run again on a
   // new kernel and, where that makes sense, on what the fault left.

@@ -79,8 +79,9 @@ class Worker {
     // What is made on first use is no leak.
     runner_.Run(scenario, {});
     Trial trial(scenario, runner_);
-    if (!trial.UndisturbedFindings().empty()) {
-      Print(scenario, "none", 0, trial.UndisturbedFindings());
+    const std::vector<std::string> undisturbed = trial.UndisturbedFindings();
+    if (!undisturbed.empty()) {
+      Print(scenario, "none", 0, undisturbed);
       ++board_.cells[board_.scenario][0].score.unexplained;
     }
     for (; board_.fault < kFaults.size(); ++board_.fault, board_.number = 0) {
