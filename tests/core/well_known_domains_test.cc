@@ -225,6 +225,55 @@ TEST_F(WellKnownDomainsTest, LoadThatEndsBeforeTheLookUpsLeavesTheIdsOfTheLastOn
   EXPECT_EQ(outcome.value, "failed: 2 3 1");
 }
 
+// A load looks up each of its three domains, then the three well-known ones, then a tardisk's.
+TEST_F(WellKnownDomainsTest, RefusedLookUpLeavesTheIdsOfTheLastLoad) {
+  for (const std::uint64_t call : {11, 12, 13}) {
+    SCOPED_TRACE(call);
+    FailNothing();
+    Fail(Operation::kFindDomain, call);
+    const Outcome outcome = Run([&] {
+      SecPolicy::LoadPolicy(PolicyDir());
+      const std::string first = Ids();
+      try {
+        SecPolicy::LoadPolicy(PolicyDir());
+      } catch (const std::exception& failure) {
+        return first + " then " + Ids() + ", " + failure.what();
+      }
+      return std::string("not refused");
+    });
+    EXPECT_EQ(outcome.value,
+              "2 3 1 then 2 3 1, refused on request: find-domain, call " + std::to_string(call));
+  }
+}
+
+TEST_P(MissingDomainTest, LeavesTheIdsOfTheLastLoad) {
+  WellKnownDomains();
+  for (const MissingDomain& domain : kMissingDomains) {
+    if (domain.name != std::string(GetParam().name)) {
+      Policy(std::string("other/domains/") + domain.name, "");
+    }
+  }
+  const Outcome outcome = Run([&] {
+    SecPolicy::LoadPolicy(PolicyDir());
+    const std::string first = Ids();
+    SecPolicy::ZekAccessInterfaceImpl iface;
+    unsigned int id = 0;
+    iface.FindDomain(GetParam().name, &id);
+    SecPolicy::DestroyDomain(id);
+    try {
+      throw std::runtime_error("the caller's own");
+    } catch (const std::exception&) {
+      try {
+        SecPolicy::LoadPolicy(PolicyPath("other"));
+      } catch (const std::exception&) {
+        return first + " then " + Ids();
+      }
+    }
+    return std::string("not ended");
+  });
+  EXPECT_EQ(outcome.value, "2 3 1 then 2 3 1");
+}
+
 TEST_F(WellKnownDomainsTest, LaterLoadReplacesTheIds) {
   const Outcome outcome = Run([&] {
     SecPolicy::LoadPolicy(PolicyDir());

@@ -53,6 +53,13 @@ TEST_F(FilePolicyReadingTest, TooLittleRoomAsksForARetryAndWritesNothing) {
             "Failed to retrieve policies from domain:: 0 : No space left on device / untouched 7");
 }
 
+TEST_F(FilePolicyReadingTest, NoRoomAtAllAsksForARetry) {
+  const Outcome outcome = Run([] { SecPolicy::RetrieveFilePolicies(0, nullptr, 0); });
+  EXPECT_EQ(outcome.error,
+            "retry: Failed to retrieve policies from domain:: 0 : No space left on device");
+  EXPECT_THAT(outcome.events, ElementsAre(testing::StartsWith("kernel: read-file-rules rootDom")));
+}
+
 TEST_F(FilePolicyReadingTest, MoreRoomThanRulesIsFilledAsFarAsItGoes) {
   const Outcome outcome = Run([] {
     std::vector<SecPolicy::ZekAccess_FileRule> rules(3, FileRule("untouched", 7));

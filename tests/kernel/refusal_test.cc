@@ -27,6 +27,41 @@ TEST_F(RefusalTest, EachCallEndsItsMessageWithTheReason) {
   }
 }
 
+// Domain 0 is rootDom, world 0 all worlds, and no rules, no room and no permission are common.
+TEST_F(RefusalTest, RefusalWithArgumentsOfZeroIsThrown) {
+  static unsigned int cell = 0;
+  static SecPolicy::ZekAccess_FileRule rule{"/a", 0};
+  struct Row {
+    Operation operation;
+    void (*call)();
+    const char* failure;
+  };
+  const Row rows[] = {
+      {Operation::kDestroyDomain, [] { SecPolicy::DestroyDomain(0); }, "Failed to destroy domain:"},
+      {Operation::kWorldDomain, [] { SecPolicy::GetDomainIDForWorld(0); },
+       "Unable to get domain ID: "},
+      {Operation::kDomainName, [] { SecPolicy::GetDomainNameForID(0); },
+       "Unable to get domain name: "},
+      {Operation::kLeakedDomains, [] { SecPolicy::RetrieveLeakedDomains(0, nullptr, &cell); },
+       "Failed to retrieve leaked domain list:"},
+      {Operation::kAddFileRules, [] { SecPolicy::AddFilePolicyBatch(0, 0, &rule, 0, &cell); },
+       "Failed to add file policies to domain :0: world ID :0:"},
+      {Operation::kRemoveFileRule, [] { SecPolicy::RemoveFilePolicy(0, 0, "/a"); },
+       "Failed to remove file policy from domain :0 : world id :0:"},
+      {Operation::kUpdateFileRule, [] { SecPolicy::UpdateFilePolicy(0, "/a", 0); },
+       "Failed to update file policy: /a: "},
+      {Operation::kCountFileRules, [] { SecPolicy::RetrieveNumberOfFilePolicies(0); },
+       "Failed to get number of file policies for domain :: 0:"},
+      {Operation::kReadFileRules, [] { SecPolicy::RetrieveFilePolicies(0, nullptr, 0); },
+       "Failed to retrieve policies from domain:: 0 : "},
+  };
+  for (const Row& row : rows) {
+    FailNothing();
+    Fail(row.operation);
+    EXPECT_EQ(Run(row.call).error, std::string(row.failure) + "Input/output error");
+  }
+}
+
 TEST_F(RefusalTest, RefusalsAreNotLogged) {
   for (const KernelCall& call : KernelCalls()) {
     FailNothing();
