@@ -103,11 +103,8 @@ TarReader::TarReader(int fd, std::string file, UnpackBudget& budget)
     : file_(std::move(file)),
       budget_(budget),
       stream_(fd, budget),
-      reader_(::archive_read_new()),
+      reader_(NewArchiveReader()),
       locale_(std::make_unique<NeutralLocale>()) {
-  if (!reader_) {
-    throw std::bad_alloc();
-  }
   ::archive_read_support_format_tar(reader_.get());
   if (::archive_read_open(reader_.get(), &stream_, nullptr, ReadBlock, nullptr) != ARCHIVE_OK) {
     RefuseAt(0, ErrorText());

@@ -9,6 +9,7 @@
 #include <string>
 #include <string_view>
 
+#include "host/image/archive_ptr.h"
 #include "host/image/unpack_budget.h"
 #include "host/image/unpacked_stream.h"
 #include "secpolicy/host/host_error.h"
@@ -26,10 +27,11 @@ struct TarEntry {
   std::uint64_t held = 0;  // of that, what the archive holds
 };
 
-// Reads every format and compression of tar archives that the archive library reads by itself;
-// names are bytes whatever the locale. Input that isn't such an archive, whole and without anything
-// after its end, is refused by whichever call meets it: HostError "FILE: entry "NAME": TEXT" or,
-// between entries, "FILE: at byte N: TEXT", where N counts the decompressed bytes.
+// Reads every format of tar archives that the archive library reads, in the compressions of
+// NewDecoder; names are bytes whatever the locale. Input that isn't such an archive, whole and
+// without anything after its end, is refused by whichever call meets it: HostError "FILE: entry
+// "NAME": TEXT" or, between entries, "FILE: at byte N: TEXT", where N counts the decompressed
+// bytes.
 class TarReader {
  public:
   // Reads from `fd`, which messages call `file`; `fd` and `budget` must outlive this object.

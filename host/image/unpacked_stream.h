@@ -6,26 +6,20 @@
 #include <string>
 #include <string_view>
 
+#include "host/image/decoder.h"
 #include "host/image/unpack_budget.h"
-
-struct archive;
-struct archive_entry;
 
 namespace StandIn {
 
-struct ArchiveCloser {
-  void operator()(archive* reader) const noexcept;
-};
-using ArchivePtr = std::unique_ptr<archive, ArchiveCloser>;
-
-// Reads a file through whatever compression it has, or none; starts no program for it. Since the
-// archive's own format isn't looked at here, what follows the end of the archive can be seen too.
+// Reads a file through whatever compression it has, or none (see NewDecoder), within a budget.
+// Since the archive's own format isn't looked at here, what follows the end of the archive can be
+// seen too.
 class UnpackedStream {
  public:
   // Reads from `fd`, which must outlive this object, and takes what it reads from `budget`.
   UnpackedStream(int fd, UnpackBudget& budget);
 
-  enum class Result { kBlock, kEnd, kError };
+  using Result = Decoder::Result;
   // The next bytes, valid until the next call. After kError, `Error()` says what is wrong; the
   // stream is of no further use.
   Result Next(std::string_view& block);
@@ -35,14 +29,8 @@ class UnpackedStream {
   [[nodiscard]] std::uint64_t EndOfContent() const { return endOfContent_; }
 
  private:
-  Result Fail(const std::string& error);
-  Result FailAsReaderSays();
-  Result Open();
-
-  int fd_;
   UnpackBudget& budget_;
-  ArchivePtr reader_;
-  bool isOpen_ = false;
+  std::unique_ptr<Decoder> decoder_;
   std::uint64_t delivered_ = 0;
   std::uint64_t endOfContent_ = 0;
   std::string error_;
