@@ -6,7 +6,10 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdio>
+#include <exception>
+#include <new>
 #include <string_view>
+#include <utility>
 
 #include "host/image/file_io.h"
 #include "host/image/image_index.h"
@@ -58,7 +61,7 @@ UniqueFd OpenArchive(const DirectoryRef& archives, const std::string& name) {
 // The root file system in the making: a directory that vanishes unless it is put into place.
 class NewRoot {
  public:
-  explicit NewRoot(const HostDirectory& host) : host_(host.Ref()) {
+  explicit NewRoot(const HostDirectory& host) : NewRoot(host.Ref()) {
     RemoveTree(host_, kNewRootDirectory);
     if (::mkdirat(host_.fd, kNewRootDirectory, S_IRWXU) != 0) {
       const int number = errno;
@@ -72,7 +75,7 @@ class NewRoot {
   ~NewRoot() {
     try {
       RemoveTree(host_, kNewRootDirectory);
-    } catch (const HostError&) {
+    } catch (const std::exception&) {
       // The next assembly tries again, and says why when it can't either.
     }
   }
@@ -101,6 +104,9 @@ class NewRoot {
   }
 
  private:
+  // A constructor that ends, so that what the other one made vanishes when that one fails.
+  explicit NewRoot(DirectoryRef host) : host_(std::move(host)) {}
+
   [[nodiscard]] bool Rename(unsigned int flags) const {
     return ::renameat2(host_.fd, kNewRootDirectory, host_.fd, kRootDirectory, flags) == 0;
   }
@@ -121,21 +127,28 @@ class NewRoot {
   UniqueFd fd_;
 };
 
-// Unpacks everything into `root`, filling `report`.
+// Unpacks everything into `root`, filling `report`. The account of the paths, which is what takes
+// memory, is gone when the shortage of it is reported.
 ImageIndex UnpackAll(const DirectoryRef& archives, const NewRoot& root, const UnpackLimits& limits,
                      AssembleReport& report) {
-  UnpackBudget budget(limits);
-  ImageLayout layout;
-  const TreeWriter tree = root.Writer();
-  for (const std::string& name : ArchiveNames(archives)) {
-    const UniqueFd fd = OpenArchive(archives, name);
-    const std::uint64_t entries =
-        Unpack({fd.Get(), name, archives.PathOf(name)}, budget, layout, tree);
-    root.AddArchive(archives, name);
-    report.tardisks.push_back({name, entries});
-    report.entries += entries;
+  std::string shown = archives.path;
+  try {
+    UnpackBudget budget(limits);
+    ImageLayout layout;
+    const TreeWriter tree = root.Writer();
+    for (const std::string& name : ArchiveNames(archives)) {
+      shown = archives.PathOf(name);
+      const UniqueFd fd = OpenArchive(archives, name);
+      const std::uint64_t entries = Unpack({fd.Get(), name, shown}, budget, layout, tree);
+      root.AddArchive(archives, name);
+      report.tardisks.push_back({name, entries});
+      report.entries += entries;
+    }
+    return layout.Index();
+  } catch (const std::bad_alloc&) {
+    throw HostError(shown + ": there is not enough memory to unpack it; the tardisks before it " +
+                    "hold " + std::to_string(report.entries) + " entries");
   }
-  return layout.Index();
 }
 
 void RemoveIndex(const DirectoryRef& host) {
@@ -156,12 +169,13 @@ AssembleReport Assemble(const HostDirectory& host, const UnpackLimits& limits) {
   AssembleReport report;
   const NewRoot root(host);
   const ImageIndex index = UnpackAll(archives, root, limits, report);
+  const std::string indexText = FormatImageIndex(index);
   // Without an index the host counts as not assembled, which is right while root/, the index and
   // the state don't belong together.
   RemoveIndex(host.Ref());
   root.PutIntoPlace();
   state.Remove();
-  ReplaceFile(host.Ref(), kIndexFile, FormatImageIndex(index), Writers::kOne);
+  ReplaceFile(host.Ref(), kIndexFile, indexText, Writers::kOne);
   return report;
 }
 

@@ -6,6 +6,7 @@
 #include "host/image/entry_path.h"
 #include "host/image/quoted_name.h"
 #include "host/json/json_cursor.h"
+#include "host/json/json_writer.h"
 
 namespace StandIn {
 
@@ -62,16 +63,23 @@ class IndexReader {
 
 }  // namespace
 
+// Not as a document tree, which would take several times the memory of the index, and needs more to
+// be destroyed.
 std::string FormatImageIndex(const ImageIndex& index) {
-  nlohmann::json tardisks = nlohmann::json::array();
+  JsonWriter writer;
+  writer.Begin(JsonWriter::Kind::kObject);
+  writer.Begin("tardisks", JsonWriter::Kind::kArray);
   for (const TardiskContent& content : index.tardisks) {
-    nlohmann::json paths = nlohmann::json::array();
-    for (const std::string& path : content.paths) {
-      paths.push_back(EncodeBytes(path));
-    }
-    tardisks.push_back({{"name", EncodeBytes(content.name)}, {"paths", std::move(paths)}});
+    writer.Begin(JsonWriter::Kind::kObject);
+    writer.Member("name", EncodeBytes(content.name));
+    writer.Begin("paths", JsonWriter::Kind::kArray);
+    for (const std::string& path : content.paths) writer.Item(EncodeBytes(path));
+    writer.End();
+    writer.End();
   }
-  return nlohmann::json{{"tardisks", std::move(tardisks)}}.dump(1) + "\n";
+  writer.End();
+  writer.End();
+  return writer.Text();
 }
 
 ImageIndex ParseImageIndex(const std::string& text, const std::string& file) {

@@ -1,5 +1,6 @@
 #include "host/image/unpack.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "host/image/entry_path.h"
@@ -42,17 +43,16 @@ void CheckKind(const TarEntry& entry) {
 
 class Unpacker {
  public:
-  Unpacker(TarReader& reader, ImageLayout& layout, const TreeWriter& tree)
-      : reader_(reader), layout_(layout), tree_(tree) {}
+  Unpacker(TarReader& reader, UnpackBudget& budget, ImageLayout& layout, const TreeWriter& tree)
+      : reader_(reader), budget_(budget), layout_(layout), tree_(tree) {}
 
   void UnpackEntry() {
     const TarEntry& entry = reader_.Entry();
     const std::string path = EntryPath(entry.name);
     CheckKind(entry);
     ImageLayout::CheckName(path, PathKindOf(entry.kind));
-    for (const std::string& parent : layout_.BringParents(path)) {
-      tree_.MakeDirectory(parent, kImpliedDirectoryMode);
-    }
+    TakePath(path);
+    MakeParents(path);
     if (entry.kind == EntryKind::kDirectory) {
       UnpackDirectory(path, entry.mode);
     } else {
@@ -61,6 +61,23 @@ class Unpacker {
   }
 
  private:
+  // The entry itself was counted by the reader.
+  void TakePath(const std::string& path) {
+    const auto depth = std::count(path.begin(), path.end(), '/');
+    if (!budget_.AllowsDepth(static_cast<std::uint64_t>(depth))) throw BadEntry(budget_.TooDeep());
+    if (!budget_.TakePath(path)) throw BadEntry(budget_.TooLongPaths());
+  }
+
+  // All are counted before the first is made.
+  void MakeParents(const std::string& path) {
+    const std::vector<std::string> parents = layout_.BringParents(path);
+    for (const std::string& parent : parents) {
+      if (!budget_.TakeEntry()) throw BadEntry(budget_.TooManyEntries());
+      TakePath(parent);
+    }
+    for (const std::string& parent : parents) tree_.MakeDirectory(parent, kImpliedDirectoryMode);
+  }
+
   void UnpackDirectory(const std::string& path, mode_t mode) {
     switch (layout_.BringDirectory(path)) {
       case ImageLayout::DirectoryUse::kMake:
@@ -119,6 +136,7 @@ class Unpacker {
   }
 
   TarReader& reader_;
+  UnpackBudget& budget_;
   ImageLayout& layout_;
   const TreeWriter& tree_;
 };
@@ -128,7 +146,7 @@ class Unpacker {
 std::uint64_t Unpack(const TardiskFile& tardisk, UnpackBudget& budget, ImageLayout& layout,
                      const TreeWriter& tree) {
   TarReader reader(tardisk.fd, tardisk.shown, budget);
-  Unpacker unpacker(reader, layout, tree);
+  Unpacker unpacker(reader, budget, layout, tree);
   layout.BeginTardisk(tardisk.name);
   std::uint64_t entries = 0;
   while (reader.Next()) {

@@ -27,6 +27,8 @@ struct TardiskFile {
 //   "device nodes are not allowed in a tardisk"
 //   "entries of this type are not allowed in a tardisk"
 //   "a symbolic link without a target", "a symbolic link with a target of more than 4095 bytes"
+//   "the name has more than N components", "the paths in the tardisks have more than N bytes
+//   together", "the tardisks hold more than N entries, with the directories that names imply"
 // and the errors of TreeWriter. What was unpacked until then is left.
 std::uint64_t Unpack(const TardiskFile& tardisk, UnpackBudget& budget, ImageLayout& layout,
                      const TreeWriter& tree);

@@ -12,6 +12,7 @@
 #include <system_error>
 
 #include "host/image/unique_fd.h"
+#include "tools/policy/error_messages.h"
 #include "tools/policy/exit_status.h"
 #include "tools/policy/output.h"
 
@@ -34,7 +35,7 @@ namespace {
     status = work();
     FlushOutput();
   } catch (const std::exception& failure) {
-    ReportError(failure.what());
+    ReportError(MessageOf(failure));
     status = kFailed;
   }
   _exit(status);

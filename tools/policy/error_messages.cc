@@ -1,5 +1,6 @@
 #include "tools/policy/error_messages.h"
 
+#include <new>
 #include <string_view>
 
 namespace SecPolicyTool {
@@ -13,6 +14,11 @@ void AddMessageLine(std::vector<std::string>& messages, const std::string& line)
   } else {
     messages.back() += "\n" + line;
   }
+}
+
+std::string MessageOf(const std::exception& failure) {
+  return dynamic_cast<const std::bad_alloc*>(&failure) != nullptr ? "there is not enough memory"
+                                                                  : failure.what();
 }
 
 }  // namespace SecPolicyTool

@@ -34,7 +34,7 @@ int Finish(const Current& now) {
   try {
     content["result"] = now.work(now.session);
   } catch (const std::exception& failure) {
-    content["failure"] = failure.what();
+    content["failure"] = MessageOf(failure);
   }
   now.letter.Write(content);
   return kDone;

@@ -3,6 +3,7 @@
 #include <exception>
 
 #include "secpolicy/secpolicy.h"
+#include "tools/policy/error_messages.h"
 #include "tools/policy/output.h"
 
 namespace SecPolicyTool {
@@ -12,7 +13,7 @@ LoadEnd LoadInBatch(StandIn::Session& session, const std::string& dir) {
   try {
     SecPolicy::LoadPolicy(dir);
   } catch (const std::exception& failure) {
-    ReportError(failure.what());
+    ReportError(MessageOf(failure));
     return LoadEnd::kFailed;
   }
   return LoadEnd::kDone;

@@ -11,6 +11,7 @@
 #include "host/image/session.h"
 #include "tools/labels/descriptor_limit.h"
 #include "tools/policy/child_process.h"
+#include "tools/policy/error_messages.h"
 #include "tools/policy/output.h"
 #include "tools/policy/policy_path.h"
 #include "tools/policy/progress.h"
@@ -47,7 +48,7 @@ const Loading* loading = nullptr;
                 loading->stateFile);
   } catch (const std::exception& failure) {
     ReportError(std::string("the load was terminated, and what it had installed is lost: ") +
-                failure.what());
+                MessageOf(failure));
   }
   _exit(kTerminated);
 }

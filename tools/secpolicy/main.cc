@@ -1,6 +1,7 @@
 #include <exception>
 #include <iostream>
 
+#include "tools/policy/error_messages.h"
 #include "tools/policy/output.h"
 #include "tools/secpolicy/verbs.h"
 
@@ -39,6 +40,6 @@ ExitStatus Run(int argc, char** argv) {
 int main(int argc, char** argv) try {
   return SecPolicyTool::Run(argc, argv);
 } catch (const std::exception& failure) {
-  SecPolicyTool::ReportError(failure.what());
+  SecPolicyTool::ReportError(SecPolicyTool::MessageOf(failure));
   return SecPolicyTool::kFailed;
 }

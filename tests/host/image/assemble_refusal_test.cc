@@ -8,6 +8,7 @@
 
 #include "host/image/state_file.h"
 #include "tests/host/image/host_fixture.h"
+#include "tests/support/counted_memory.h"
 
 namespace StandIn {
 namespace {
@@ -25,6 +26,13 @@ class RefusalFixture : public HostFixture {
     Assembled();
     StateFile(Host()).Write("state");
     before_ = Snapshot();
+  }
+
+  // What an assembly in which memory ends may say.
+  [[nodiscard]] std::string ErrorInShortage() const try {
+    return AssembleError();
+  } catch (const std::bad_alloc& shortage) {
+    return shortage.what();
   }
 
   void ExpectNothingChanged() const { EXPECT_EQ(Snapshot(), before_); }
@@ -306,9 +314,79 @@ TEST_F(AssembleRefusalTest, AHostNeedsItsArchivesDirectory) {
 TEST_F(AssembleRefusalTest, TooManyEntriesAreRefused) {
   Tardisk("new.tar", Archive().File("a", "").File("b", ""));
   EXPECT_EQ(AssembleError({.entries = 6}),
-            Path("tardisks/new.tar") + ": at byte 512: the tardisks hold more than 6 entries");
+            Path("tardisks/new.tar") +
+                ": at byte 512: the tardisks hold more than 6 entries, with the directories that "
+                "names imply");
   ExpectNothingChanged();
   EXPECT_EQ(AssembleError({.entries = 7}), "(nothing was thrown)");
+}
+
+TEST_F(AssembleRefusalTest, DirectoriesThatANameImpliesAreEntries) {
+  Tardisk("new.tar", Archive().File("a/b/c/f", "").File("a/b/d/f", ""));
+  EXPECT_EQ(AssembleError({.entries = 8}),
+            Path("tardisks/new.tar") +
+                ": entry \"a/b/c/f\": the tardisks hold more than 8 entries, with the directories "
+                "that names imply");
+  ExpectNothingChanged();
+  EXPECT_EQ(AssembleError({.entries = 10}),
+            Path("tardisks/new.tar") +
+                ": entry \"a/b/d/f\": the tardisks hold more than 10 entries, with the directories "
+                "that names imply");
+  EXPECT_EQ(AssembleError({.entries = 11}), "(nothing was thrown)");
+}
+
+TEST_F(AssembleRefusalTest, DeepNamesAreRefused) {
+  Tardisk("new.tar", PaxName(RepeatedName("d/", 256) + "f"));
+  EXPECT_EQ(AssembleError(), Path("tardisks/new.tar") + ": entry \"" + RepeatedName("d/", 127) +
+                                 "d...\": the name has more than 256 components");
+  ExpectNothingChanged();
+  EXPECT_EQ(AssembleError({.depth = 257}), "(nothing was thrown)");
+}
+
+TEST_F(AssembleRefusalTest, PathsAreLimitedTogether) {
+  const std::string long1(200, 'n');
+  const std::string long2(200, 'm');
+  Tardisk("new.tar", Archive().File("1/" + long1, "").File("2/" + long2, ""));
+  // 29 in base.tar, and here twice 2 for the directory and 203 for the file.
+  EXPECT_EQ(AssembleError({.pathBytes = 438}),
+            Path("tardisks/new.tar") + ": entry \"2/" + long2 +
+                "\": the paths in the tardisks have more than 438 bytes together");
+  ExpectNothingChanged();
+  EXPECT_EQ(AssembleError({.pathBytes = 439}), "(nothing was thrown)");
+}
+
+// Nothing is made before the refusal, however many directories a short name implies.
+TEST_F(AssembleRefusalTest, ManyImpliedDirectoriesAreRefusedEarly) {
+  Archive archive;
+  for (int i = 0; i < 2000; ++i) {
+    archive.File(std::to_string(i) + "/" + RepeatedName("d/", 200) + "f", "");
+  }
+  Tardisk("new.tar", archive);
+  EXPECT_EQ(AssembleError({.entries = 5 + 202 + 100}),
+            Path("tardisks/new.tar") + ": entry \"1/" + RepeatedName("d/", 126) +
+                "d...\": the tardisks hold more than 307 entries, with the directories that names "
+                "imply");
+  ExpectNothingChanged();
+}
+
+TEST_F(AssembleRefusalTest, WhereMemoryEndsTheArchiveIsNamed) {
+  const std::string expected = Path("tardisks/new.tar") +
+                               ": there is not enough memory to unpack it; the tardisks before it "
+                               "hold 5 entries";
+  Tardisk("new.tar", Archive().File("a/b/c/f", "text").File("a/b/d/f", ""));
+  int named = 0;
+  // Every third allocation fails, up to the first after the unpacking.
+  for (unsigned int allocation = 0;; allocation += 3) {
+    SecPolicyTest::FailAllocation(allocation);
+    const std::string message = ErrorInShortage();
+    const bool failed = SecPolicyTest::AllocationFailed();
+    SecPolicyTest::FailNoAllocation();
+    if (!failed || (named > 0 && message != expected)) break;
+    EXPECT_THAT(message, testing::AnyOf(testing::HasSubstr("enough memory"), "std::bad_alloc"));
+    named += message == expected ? 1 : 0;
+    ExpectNothingChanged();
+  }
+  EXPECT_GT(named, 5);
 }
 
 TEST_F(AssembleRefusalTest, ADecompressionBombIsRefused) {

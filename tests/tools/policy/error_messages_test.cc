@@ -3,6 +3,9 @@
 
 #include <gmock/gmock.h>
 
+#include <new>
+#include <stdexcept>
+
 namespace SecPolicyTool {
 namespace {
 
@@ -25,6 +28,12 @@ TEST(AddMessageLineTest, AnyOtherLineGoesOnWithTheLastMessage) {
 
 TEST(AddMessageLineTest, FirstLineIsNotLostForWantOfAMark) {
   EXPECT_THAT(MessagesOf({"no mark", "Error: one"}), ElementsAre("no mark", "one"));
+}
+
+TEST(MessageOfTest, MemoryThatEndsIsSaidInWords) {
+  EXPECT_EQ(MessageOf(std::runtime_error("text")), "text");
+  EXPECT_EQ(MessageOf(std::bad_alloc()), "there is not enough memory");
+  EXPECT_EQ(MessageOf(std::bad_array_new_length()), "there is not enough memory");
 }
 
 }  // namespace
