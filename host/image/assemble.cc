@@ -162,7 +162,7 @@ void RemoveIndex(const DirectoryRef& host) {
 
 AssembleReport Assemble(const HostDirectory& host, const UnpackLimits& limits) {
   StateFile state(host);
-  const StateFile::Lock lock(state, LockMode::kExclusive);
+  const StateFile::Lock lock(state);
   const UniqueFd fd = OpenDirectory(host.Ref(), kTardiskDirectory);
   const DirectoryRef archives{fd.Get(), host.Ref().PathOf(kTardiskDirectory)};
 

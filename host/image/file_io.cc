@@ -97,13 +97,13 @@ std::string ReadAll(int fd, const std::string& file) {
   return text;
 }
 
-std::optional<std::string> ReadFileIfThere(const DirectoryRef& dir, const std::string& name) {
+UniqueFd OpenFileIfThere(const DirectoryRef& dir, const std::string& name) {
   const std::string file = dir.PathOf(name);
   // Without O_NONBLOCK a fifo of that name would hold the caller up for ever.
-  const UniqueFd fd(::openat(dir.fd, name.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+  UniqueFd fd(::openat(dir.fd, name.c_str(), O_RDONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
   if (!fd.IsOpen()) {
     if (errno == ENOENT) {
-      return std::nullopt;
+      return fd;
     }
     throw SystemFailure(file, "opened", errno);
   }
@@ -114,7 +114,15 @@ std::optional<std::string> ReadFileIfThere(const DirectoryRef& dir, const std::s
   if (!S_ISREG(status.st_mode)) {
     throw HostError(file + ": not a regular file");
   }
-  return ReadAll(fd.Get(), file);
+  return fd;
+}
+
+std::optional<std::string> ReadFileIfThere(const DirectoryRef& dir, const std::string& name) {
+  const UniqueFd fd = OpenFileIfThere(dir, name);
+  if (!fd.IsOpen()) {
+    return std::nullopt;
+  }
+  return ReadAll(fd.Get(), dir.PathOf(name));
 }
 
 std::string ReadFile(const DirectoryRef& dir, const std::string& name) {

@@ -10,9 +10,13 @@
 
 namespace StandIn {
 
-// The content of the regular file `name` in `dir`; nothing when there is no such file. Throws
-// HostError "DIR/NAME: cannot be opened: REASON", "...: cannot be read: REASON" or "DIR/NAME: not a
-// regular file".
+// Opens the regular file `name` in `dir` for reading; the result is closed when there is no such
+// file. Never waits, whatever has the name. Throws HostError "DIR/NAME: cannot be opened: REASON"
+// or "DIR/NAME: not a regular file".
+UniqueFd OpenFileIfThere(const DirectoryRef& dir, const std::string& name);
+
+// The content of that file; nothing when there is none. Throws HostError as above, or "DIR/NAME:
+// cannot be read: REASON".
 std::optional<std::string> ReadFileIfThere(const DirectoryRef& dir, const std::string& name);
 
 // As above for a file that has to be there: its absence is HostError "DIR/NAME: cannot be opened:

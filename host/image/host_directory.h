@@ -1,6 +1,7 @@
 // The directory on disk that stands for a machine.
 #pragma once
 
+#include <chrono>
 #include <string>
 
 #include "host/image/file_io.h"
@@ -15,7 +16,15 @@ inline constexpr char kRootDirectory[] = "root";         // the root file system
 inline constexpr char kNewRootDirectory[] = "root.new";  // the same in the making
 inline constexpr char kIndexFile[] = "image.json";       // which archive brought which path
 inline constexpr char kStateFile[] = "kernel.json";      // what the security module holds
-inline constexpr char kLockFile[] = "kernel.lock";       // guards all of these but the first two
+inline constexpr char kLockFile[] = "kernel.lock";       // held by whoever changes these
+
+// How long whoever changes a host waits for another one to end, unless told otherwise.
+inline constexpr std::chrono::seconds kLockWait(30);
+
+// How a host is changed.
+struct ChangeOptions {
+  std::chrono::seconds wait = kLockWait;  // for the host's lock
+};
 
 // An open host directory. Everything in it is reached through one descriptor, so that it stays
 // reachable from a process that has changed its root directory.
@@ -39,12 +48,17 @@ class HostDirectory {
   // Both of them; valid as long as this object.
   [[nodiscard]] DirectoryRef Ref() const { return {fd_.Get(), path_}; }
 
+  // How changes through this object are made; see StateFile::Lock.
+  void SetChanges(const ChangeOptions& options) { changes_ = options; }
+  [[nodiscard]] const ChangeOptions& Changes() const { return changes_; }
+
   // The content of host.json. Errors of ReadFile.
   [[nodiscard]] std::string DescriptionText() const { return ReadFile(Ref(), kDescriptionFile); }
 
  private:
   std::string path_;
   UniqueFd fd_;
+  ChangeOptions changes_;
 };
 
 }  // namespace StandIn

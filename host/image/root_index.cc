@@ -6,7 +6,8 @@
 #include <utility>
 
 #include "host/image/beneath.h"
-#include "host/image/file_io.h"
+#include "host/image/image_file.h"
+#include "secpolicy/host/host_error.h"
 
 namespace StandIn {
 
@@ -21,12 +22,24 @@ RootIndex::RootIndex(const ImageIndex& index, UniqueFd root) : root_(std::move(r
 }
 
 std::optional<RootIndex> RootIndex::Load(const HostDirectory& host) {
-  const std::optional<std::string> text = ReadFileIfThere(host.Ref(), kIndexFile);
-  if (!text) {
+  UniqueFd root;
+  std::string failure;
+  const std::optional<ImageIndex> index = ReadImage(host, [&] {
+    // Missing without an index too, and for a moment while the host is assembled.
+    try {
+      root = OpenDirectory(host.Ref(), kRootDirectory);
+      failure.clear();
+    } catch (const HostError& problem) {
+      failure = problem.what();
+    }
+  });
+  if (!index) {
     return std::nullopt;
   }
-  const ImageIndex index = ParseImageIndex(*text, host.Ref().PathOf(kIndexFile));
-  return RootIndex(index, OpenDirectory(host.Ref(), kRootDirectory));
+  if (!failure.empty()) {
+    throw HostError(failure);
+  }
+  return RootIndex(*index, std::move(root));
 }
 
 std::optional<std::string> RootIndex::PathOf(dev_t device, ino_t inode) const {

@@ -22,9 +22,8 @@ class RootIndex {
   // `root` is a descriptor of root/ (O_PATH will do).
   RootIndex(const ImageIndex& index, UniqueFd root);
 
-  // That of a host; nothing when the host has not been assembled. Call it under the host's lock.
-  // Throws HostError: "DIR/root: cannot be opened: REASON" and the errors of ReadFileIfThere and
-  // ParseImageIndex.
+  // That of a host; nothing when the host has not been assembled. Throws HostError: "DIR/root:
+  // cannot be opened: REASON" and the errors of ReadImage.
   static std::optional<RootIndex> Load(const HostDirectory& host);
 
   // The path within the root file system of the file with these numbers, beginning with "/"; of

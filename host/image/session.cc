@@ -17,8 +17,7 @@ ModuleDescription DescriptionOf(const HostDirectory& host) {
   return ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile));
 }
 
-RootIndex FilesOf(const HostDirectory& host, const StateFile& state) {
-  const StateFile::Lock lock(state, LockMode::kShared);
+RootIndex FilesOf(const HostDirectory& host) {
   auto files = RootIndex::Load(host);
   if (!files) {
     throw HostError(host.Path() + " has not been assembled; do it with \"secpolicy host assemble " +
@@ -34,11 +33,6 @@ std::string WithoutLinks(const std::string& path) {
   return resolved;
 }
 
-void RefreshUnderLock(StateKeeper& keeper, const StateFile& state) {
-  const StateFile::Lock lock(state, LockMode::kShared);
-  keeper.Refresh();
-}
-
 }  // namespace
 
 Session::Session(HostDirectory host, const SessionOptions& options)
@@ -49,9 +43,9 @@ Session::Session(HostDirectory host, const SessionOptions& options)
       keeper_(file_, host_.Ref().PathOf(kStateFile), module_),
       trace_(options.trace),
       observed_(module_, point_),
-      files_(FilesOf(host_, file_)),
+      files_(FilesOf(host_)),
       attached_{observed_, point_, module_, files_} {
-  if (options.kernel != SessionOptions::Kernel::kScratch) RefreshUnderLock(keeper_, file_);
+  if (options.kernel != SessionOptions::Kernel::kScratch) keeper_.Refresh();
   for (const Fault& fault : options.faults) faults_.Add(fault);
   // The lock is held around everything; a fault is traced as the refusal that it stands for. What
   // has nothing to do would cost every operation a little.

@@ -12,31 +12,35 @@
 
 namespace StandIn {
 
-enum class LockMode { kShared, kExclusive };
-
 // kernel.json of a host directory. Its content is a text here.
 //
-// Whoever reads holds a Lock, whoever writes an exclusive one; the calls below don't see to that
-// themselves, since most need the lock for longer than one call. A process that ends, in whatever
-// way, gives its lock up and leaves the old content or the new one whole.
+// Whoever writes holds a Lock; the calls below don't see to that themselves, since most need the
+// lock for longer than one call. Whoever reads needs none: the content is replaced as a whole. A
+// process that ends, in whatever way, gives its lock up and leaves the old content or the new one
+// whole.
 class StateFile {
  public:
   // `dirFd` is a descriptor of the host directory (O_PATH will do) that outlives this object;
   // `dirPath` is for messages.
-  StateFile(int dirFd, std::string dirPath);
-  explicit StateFile(const HostDirectory& host) : StateFile(host.Descriptor(), host.Path()) {}
+  StateFile(int dirFd, std::string dirPath, const ChangeOptions& changes);
+  explicit StateFile(const HostDirectory& host)
+      : StateFile(host.Descriptor(), host.Path(), host.Changes()) {}
 
-  // Holds kernel.lock, which is made when it is not there, as long as it lives. A second Lock of
-  // the same process is a stranger to the first: taking an exclusive one while another is held
-  // waits for ever.
+  // Holds kernel.lock, which is made when it is not there, as long as it lives. Only those who may
+  // write to the host directory may open that file, so that nobody else can hold them up. A second
+  // Lock of the same process is a stranger to the first.
   //
   // Not for use across fork(): a child's copy of a Lock guards nothing, and its end changes
   // nothing.
   class Lock {
    public:
-    // Waits until the lock is free. Throws HostError "DIR/kernel.lock: cannot be opened: REASON" or
-    // "...: cannot be locked: REASON".
-    Lock(const StateFile& state, LockMode mode);
+    // Waits until the lock is free, but no longer than `changes.wait`. Throws HostError
+    //   "DIR/kernel.lock: cannot be opened: REASON", "...: cannot be locked: REASON"
+    //   "DIR/kernel.lock: not a regular file"
+    //   "DIR/kernel.lock: has other names, which are not this host's"
+    //   "DIR/kernel.lock: is locked by HOLDER, which kept it for the N seconds of waiting; "--wait
+    //   SECONDS" waits longer"   HOLDER is "process PID", or "another process" when that is unknown
+    explicit Lock(const StateFile& state);
     ~Lock();
     Lock(const Lock&) = delete;
     Lock& operator=(const Lock&) = delete;
@@ -67,6 +71,8 @@ class StateFile {
 
   // The content; nothing when there is no file. Errors of ReadFileIfThere.
   [[nodiscard]] std::optional<std::string> Read();
+  // The version of what Read returned or Write wrote last.
+  [[nodiscard]] const Version& LastVersion() const { return last_; }
 
   // Replaces the content. Errors of ReplaceFile.
   void Write(const std::string& text);
@@ -76,11 +82,14 @@ class StateFile {
   void Remove();
 
  private:
-  // Keeps the file that is there now open.
-  void Pin();
+  static Version VersionOf(const struct stat& status);
+  // Keeps the file `fd` open, if it is one, as the one that was read or written last.
+  void Pin(UniqueFd fd);
 
   DirectoryRef dir_;
+  ChangeOptions changes_;
   UniqueFd pinned_;
+  Version last_;
 };
 
 }  // namespace StandIn

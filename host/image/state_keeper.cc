@@ -12,11 +12,10 @@ StateKeeper::StateKeeper(StateFile& file, std::string path, SimulatedModule& mod
     : file_(file), path_(std::move(path)), module_(module), initial_(module.Save()) {}
 
 void StateKeeper::Refresh() {
-  const StateFile::Version current = file_.CurrentVersion();
-  if (current == version_) return;
+  if (file_.CurrentVersion() == version_) return;
   const auto text = file_.Read();
   module_.Restore(text ? *text : initial_, path_);
-  version_ = current;
+  version_ = file_.LastVersion();
 }
 
 void StateKeeper::Around(const OperationCall& call, const Callable<void>& proceed) {
@@ -27,18 +26,20 @@ void StateKeeper::Around(const OperationCall& call, const Callable<void>& procee
     return proceed();
   }
   try {
-    const StateFile::Lock lock(
-        file_, effect == Effect::kChanges ? LockMode::kExclusive : LockMode::kShared);
+    if (effect != Effect::kChanges) {
+      Refresh();
+      return proceed();
+    }
+    const StateFile::Lock lock(file_);
     Refresh();
-    Guarded(effect, proceed);
+    Guarded(proceed);
   } catch (const HostError& failure) {
     throw ModuleError(EIO, failure.what());
   }
 }
 
 // A refused operation may have done part of its work, which is kept as well.
-void StateKeeper::Guarded(Effect effect, const Callable<void>& proceed) {
-  if (effect != Effect::kChanges) return proceed();
+void StateKeeper::Guarded(const Callable<void>& proceed) {
   try {
     proceed();
   } catch (...) {
@@ -51,7 +52,7 @@ void StateKeeper::Guarded(Effect effect, const Callable<void>& proceed) {
 void StateKeeper::Write() {
   try {
     file_.Write(module_.Save());
-    version_ = file_.CurrentVersion();
+    version_ = file_.LastVersion();
   } catch (...) {
     // Back to what is kept.
     version_.reset();
@@ -61,7 +62,7 @@ void StateKeeper::Write() {
 }
 
 void StateKeeper::BeginBatch() {
-  batch_.emplace(file_, LockMode::kExclusive);
+  batch_.emplace(file_);
   try {
     Refresh();
   } catch (...) {

@@ -10,10 +10,10 @@
 
 namespace StandIn {
 
-// Surrounds each operation: takes the lock, reads what other processes wrote since, and writes what
-// the operation changed, so that an operation that reported success is kept and those of several
-// processes follow one another as in one kernel. An operation whose change cannot be written is
-// refused with EIO and changes nothing.
+// Surrounds each operation: takes the lock for a change, reads what other processes wrote since,
+// and writes what the operation changed, so that an operation that reported success is kept and
+// those of several processes follow one another as in one kernel. An operation whose change cannot
+// be written is refused with EIO and changes nothing.
 class StateKeeper final : public OperationHook {
  public:
   // `file` and `module` must outlive this object; `path` is what messages call the file. What
@@ -34,7 +34,7 @@ class StateKeeper final : public OperationHook {
   void Commit();
 
  private:
-  void Guarded(Effect effect, const Callable<void>& proceed);
+  void Guarded(const Callable<void>& proceed);
   void Write();
 
   StateFile& file_;

@@ -1,6 +1,11 @@
 // Making, assembling and inspecting hosts.
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
 #include <filesystem>
 
+#include "host/image/unique_fd.h"
 #include "tests/tools/command_fixture.h"
 
 namespace SecPolicyTool {
@@ -61,6 +66,72 @@ TEST_F(HostVerbsTest, ArchiveThatIsNoneIsRefusedAndTheHostStays) {
   EXPECT_EQ(result.out, "");
   EXPECT_THAT(result.err, StartsWith("Error: " + Host() + "/tardisks/bad.tar: "));
   EXPECT_EQ(StandIn::ReadBytes(Host() + "/root/motd"), "old\n");
+}
+
+// A lock of the host that this process holds.
+class HeldLock {
+ public:
+  explicit HeldLock(const std::string& host)
+      : fd_(::open((host + "/kernel.lock").c_str(), O_RDWR | O_CLOEXEC)) {
+    struct flock range {};
+    range.l_type = F_WRLCK;
+    EXPECT_EQ(::fcntl(fd_.Get(), F_SETLK, &range), 0);
+  }
+
+ private:
+  StandIn::UniqueFd fd_;
+};
+
+TEST_F(HostVerbsTest, VerbsThatChangeAHostWaitAsLongAsAskedAndNameTheHolder) {
+  MakeHost();
+  const HeldLock lock(Host());
+  const std::string error =
+      Host() + "/kernel.lock: is locked by process " + std::to_string(::getpid()) +
+      ", which kept it for the 0 seconds of waiting; \"--wait SECONDS\" waits "
+      "longer\n";
+  const std::vector<Arguments> changes = {
+      {"host", "assemble", "--wait", "0", Host()},
+      {"load", "--host", Host(), "--wait", "0", PolicyDir()},
+      {"label", "set", "--host", Host(), "--wait", "0", "/tardisks", "tardisk"},
+      {"domain", "create", "--host", Host(), "--wait", "0", "newDom"},
+      {"domain", "destroy", "--host", Host(), "--wait", "0", "0"},
+      {"files", "add", "--host", Host(), "--wait", "0", "0", "/a", "r"},
+      {"files", "update", "--host", Host(), "--wait", "0", "0", "/a", "r"},
+      {"files", "remove", "--host", Host(), "--wait", "0", "0", "/a"},
+      {"files", "rename", "--host", Host(), "--wait", "0", "/a", "/b"}};
+  for (const Arguments& change : changes) {
+    const Result result = Command(change);
+    EXPECT_EQ(result.status, 1) << change[0] << " " << change[1];
+    EXPECT_THAT(result.err, HasSubstr(error)) << change[0] << " " << change[1];
+  }
+}
+
+TEST_F(HostVerbsTest, VerbsThatReadAHostNeedNoLock) {
+  MakeHost();
+  const HeldLock lock(Host());
+  for (const Arguments& question :
+       {Arguments{"host", "info", Host()}, Arguments{"show", "--host", Host()},
+        Arguments{"digest", "--host", Host(), "kernel"},
+        Arguments{"domain", "list", "--host", Host()},
+        Arguments{"label", "get", "--host", Host(), "/tardisks"}}) {
+    EXPECT_EQ(Command(question).status, 0) << question[0] << " " << question[1];
+  }
+}
+
+TEST_F(HostVerbsTest, AFifoInPlaceOfTheLockHoldsNobodyUp) {
+  MakeHost();
+  fs::remove(Host() + "/kernel.lock");
+  ASSERT_EQ(::mkfifo((Host() + "/kernel.lock").c_str(), 0600), 0);
+  const Result result = Command({"host", "assemble", Host()});
+  EXPECT_EQ(result.status, 1);
+  EXPECT_EQ(result.err, "Error: " + Host() + "/kernel.lock: not a regular file\n");
+  Done({"host", "info", Host()});
+}
+
+TEST_F(HostVerbsTest, TheWaitIsANumberOfSeconds) {
+  for (const char* wait : {"-1", "x", "1.5", "86401"}) {
+    EXPECT_EQ(Command({"host", "assemble", "--wait", wait, Host()}).status, 2) << wait;
+  }
 }
 
 TEST_F(HostVerbsTest, MissingHostIsNamedAndHowToMakeIt) {

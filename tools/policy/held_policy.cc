@@ -2,6 +2,7 @@
 
 #include <cerrno>
 
+#include "host/image/image_file.h"
 #include "host/image/proc_processes.h"
 #include "host/image/state_keeper.h"
 #include "host/module/description_json.h"
@@ -87,8 +88,7 @@ Policy HeldPolicy(SecurityModule& module, const ImageIndex& image) {
 }
 
 ImageIndex ImageOf(const HostDirectory& host) {
-  const auto text = ReadFileIfThere(host.Ref(), kIndexFile);
-  return text ? ParseImageIndex(*text, host.Ref().PathOf(kIndexFile)) : ImageIndex();
+  return ReadImage(host, [] {}).value_or(ImageIndex());
 }
 
 Policy HeldPolicy(const HostDirectory& host) {
@@ -97,9 +97,8 @@ Policy HeldPolicy(const HostDirectory& host) {
       ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile)), processes);
   StateFile file(host);
   StateKeeper keeper(file, host.Ref().PathOf(kStateFile), module);
-  const StateFile::Lock lock(file, LockMode::kShared);
-  keeper.Refresh();
-  return HeldPolicy(module, ImageOf(host));
+  const ImageIndex image = ReadImage(host, [&] { keeper.Refresh(); }).value_or(ImageIndex());
+  return HeldPolicy(module, image);
 }
 
 }  // namespace SecPolicyTool

@@ -20,6 +20,7 @@ namespace {
 
 struct DomainArguments {
   std::string host;
+  StandIn::ChangeOptions changes;
   bool isJson = false;
   std::string domain;  // a name or an id
   int world = 0;
@@ -98,6 +99,18 @@ CommandLine DomainVerbOf(const char* name, const char* description,
           }};
 }
 
+// The same for one that changes the host.
+CommandLine DomainChangeOf(CommandLine verb, const SharedDomainArguments& arguments,
+                           void (*change)(const DomainArguments&)) {
+  AddChangeOptions(verb, arguments->changes);
+  verb.run = [arguments, change] {
+    const auto session = EnterHost(arguments->host, {}, arguments->changes);
+    ChangeHost(*session, [&] { change(*arguments); });
+    return kDone;
+  };
+  return verb;
+}
+
 CommandOption DomainOperand(const SharedDomainArguments& arguments, const char* name,
                             const char* description) {
   return {.names = {name},
@@ -121,15 +134,19 @@ CommandLine DomainVerb() {
   CommandLine verb{
       .name = "domain",
       .description = "List, make and destroy a kernel's domains",
-      .verbs = {DomainVerbOf("list", "List the domains with their ids", arguments, List),
-                DomainVerbOf("create", "Make an empty domain, as host services do", arguments,
-                             Create, {DomainOperand(arguments, "NAME", "The new domain's name")}),
-                DomainVerbOf("destroy", "Destroy a domain", arguments, Destroy, {domain}),
-                DomainVerbOf("name", "Print a domain's id and name", arguments, Name, {domain}),
-                DomainVerbOf("of", "Print the domain that a process runs in", arguments, Of,
-                             {WorldOperand(arguments)}),
-                DomainVerbOf("leaked", "List the domains that their makers left behind", arguments,
-                             Leaked)}};
+      .verbs = {
+          DomainVerbOf("list", "List the domains with their ids", arguments, List),
+          DomainChangeOf(
+              DomainVerbOf("create", "Make an empty domain, as host services do", arguments, Create,
+                           {DomainOperand(arguments, "NAME", "The new domain's name")}),
+              arguments, Create),
+          DomainChangeOf(DomainVerbOf("destroy", "Destroy a domain", arguments, Destroy, {domain}),
+                         arguments, Destroy),
+          DomainVerbOf("name", "Print a domain's id and name", arguments, Name, {domain}),
+          DomainVerbOf("of", "Print the domain that a process runs in", arguments, Of,
+                       {WorldOperand(arguments)}),
+          DomainVerbOf("leaked", "List the domains that their makers left behind", arguments,
+                       Leaked)}};
   for (CommandLine& below : verb.verbs) {
     if (below.name != "destroy") below.options.push_back(JsonOption(arguments->isJson));
   }

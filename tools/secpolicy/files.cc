@@ -23,6 +23,7 @@ namespace {
 
 struct FilesArguments {
   std::string host;
+  StandIn::ChangeOptions changes;
   bool isJson = false;
   std::string domain;  // a name or an id
   std::string path;
@@ -129,6 +130,23 @@ CommandLine FilesVerbOf(const char* name, const char* description,
   return verb;
 }
 
+// The same for one that changes the host.
+CommandLine FilesChangeOf(const char* name, const char* description,
+                          const SharedFilesArguments& arguments,
+                          void (*change)(const FilesArguments&),
+                          std::vector<CommandOption> operands,
+                          const std::vector<CommandOption>& options = {}) {
+  CommandLine verb =
+      FilesVerbOf(name, description, arguments, change, std::move(operands), options);
+  AddChangeOptions(verb, arguments->changes);
+  verb.run = [arguments, change] {
+    const auto session = EnterHost(arguments->host, {}, arguments->changes);
+    ChangeHost(*session, [&] { change(*arguments); });
+    return kDone;
+  };
+  return verb;
+}
+
 }  // namespace
 
 CommandLine FilesVerb() {
@@ -138,21 +156,22 @@ CommandLine FilesVerb() {
   const CommandOption permission = PermissionOperand(arguments);
   const CommandOption jsonOption = JsonOption(arguments->isJson);
   const CommandOption world = WorldOption(arguments);
-  return {.name = "files",
-          .description = "Read and change a domain's file rules directly",
-          .verbs = {
-              FilesVerbOf("list", "List a domain's file rules", arguments, List, {domain},
-                          {jsonOption}),
-              FilesVerbOf("add", "Add a rule, or give an existing one another permission",
-                          arguments, Add, {domain, path, permission}, {world}),
-              FilesVerbOf("update", "Give the rules of a path another permission", arguments,
-                          Update, {domain, path, permission}),
-              FilesVerbOf("remove", "Remove a rule", arguments, Remove, {domain, path}, {world}),
-              FilesVerbOf("rename", "Rename a path in the rules of all domains", arguments, Rename,
-                          {PathOperand(arguments, "OLD"),
-                           Required("NEW", "The path that it gets", Into(arguments->newPath))}),
-              FilesVerbOf("count", "Print the number of a domain's file rules", arguments, Count,
-                          {domain}, {jsonOption})}};
+  return {
+      .name = "files",
+      .description = "Read and change a domain's file rules directly",
+      .verbs = {
+          FilesVerbOf("list", "List a domain's file rules", arguments, List, {domain},
+                      {jsonOption}),
+          FilesChangeOf("add", "Add a rule, or give an existing one another permission", arguments,
+                        Add, {domain, path, permission}, {world}),
+          FilesChangeOf("update", "Give the rules of a path another permission", arguments, Update,
+                        {domain, path, permission}),
+          FilesChangeOf("remove", "Remove a rule", arguments, Remove, {domain, path}, {world}),
+          FilesChangeOf("rename", "Rename a path in the rules of all domains", arguments, Rename,
+                        {PathOperand(arguments, "OLD"),
+                         Required("NEW", "The path that it gets", Into(arguments->newPath))}),
+          FilesVerbOf("count", "Print the number of a domain's file rules", arguments, Count,
+                      {domain}, {jsonOption})}};
 }
 
 }  // namespace SecPolicyTool

@@ -1,4 +1,4 @@
-// secpolicy host assemble DIR
+// secpolicy host assemble [--wait SECONDS] DIR
 #include <iostream>
 #include <memory>
 
@@ -11,8 +11,15 @@ namespace SecPolicyTool {
 
 namespace {
 
-ExitStatus AssembleHost(const std::string& dir) {
-  const StandIn::AssembleReport report = StandIn::Assemble(StandIn::HostDirectory(dir));
+struct AssembleArguments {
+  std::string host;
+  StandIn::ChangeOptions changes;
+};
+
+ExitStatus AssembleHost(const AssembleArguments& arguments) {
+  StandIn::HostDirectory host(arguments.host);
+  host.SetChanges(arguments.changes);
+  const StandIn::AssembleReport report = StandIn::Assemble(host);
   for (const auto& tardisk : report.tardisks) {
     std::cout << tardisk.name << ": " << tardisk.entries << " entries\n";
   }
@@ -23,12 +30,15 @@ ExitStatus AssembleHost(const std::string& dir) {
 }  // namespace
 
 CommandLine HostAssembleVerb() {
-  const auto dir = std::make_shared<std::string>();
-  return {.name = "assemble",
-          .description =
-              "Unpack a host's tardisks into its root file system, and start its kernel anew",
-          .operands = {HostOperand(*dir, "The host directory")},
-          .run = [dir] { return AssembleHost(*dir); }};
+  const auto arguments = std::make_shared<AssembleArguments>();
+  CommandLine verb{
+      .name = "assemble",
+      .description =
+          "Unpack a host's tardisks into its root file system, and start its kernel anew",
+      .operands = {HostOperand(arguments->host, "The host directory")},
+      .run = [arguments] { return AssembleHost(*arguments); }};
+  AddChangeOptions(verb, arguments->changes);
+  return verb;
 }
 
 }  // namespace SecPolicyTool

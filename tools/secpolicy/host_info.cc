@@ -53,10 +53,7 @@ void PrintKernel(const HostDirectory& host, const ModuleDescription& description
   SimulatedModule module(description, processes);
   StateFile file(host);
   StateKeeper keeper(file, host.Ref().PathOf(kStateFile), module);
-  {
-    const StateFile::Lock lock(file, LockMode::kShared);
-    keeper.Refresh();
-  }
+  keeper.Refresh();
   std::cout << "Objects: " << module.Words(WordList::kObjects).size() << "\nDomains:\n";
   for (DomainId domain = 0; domain < module.MaxDomains(); ++domain) PrintDomain(module, domain);
 }

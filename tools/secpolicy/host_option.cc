@@ -1,5 +1,7 @@
 #include "tools/secpolicy/host_option.h"
 
+#include <chrono>
+#include <cstdint>
 #include <cstdlib>
 #include <filesystem>
 
@@ -34,12 +36,13 @@ fs::path StateDirectory() {
   return home / ".local" / "state";
 }
 
-HostDirectory OpenOwnHost() {
+HostDirectory OpenOwnHost(const StandIn::ChangeOptions& changes) {
   const fs::path dir = StateDirectory() / "secpolicy" / "host";
   if (!fs::exists(dir / StandIn::kDescriptionFile)) {
     HostDirectory::Create(dir.string(), StandIn::DefaultDescriptionText());
   }
   HostDirectory host(dir.string());
+  host.SetChanges(changes);
   if (!fs::exists(dir / StandIn::kIndexFile)) StandIn::Assemble(host);
   return host;
 }
@@ -66,8 +69,23 @@ CommandOption JsonOption(bool& isJson) {
   return {.names = {"--json"}, .description = "Print JSON, for programs", .store = Into(isJson)};
 }
 
-HostDirectory OpenHost(const std::string& dir) {
-  return dir.empty() ? OpenOwnHost() : HostDirectory(dir);
+void AddChangeOptions(CommandLine& verb, StandIn::ChangeOptions& changes) {
+  constexpr std::int64_t kLongestWait = 24 * 60 * 60;
+  verb.options.push_back({.names = {"--wait"},
+                          .value = "SECONDS",
+                          .description = "Wait so long for another process that changes the host",
+                          .store =
+                              [&changes](const std::string& text) {
+                                changes.wait =
+                                    std::chrono::seconds(WholeNumber(text, 0, kLongestWait));
+                              },
+                          .defaultValue = std::to_string(StandIn::kLockWait.count())});
+}
+
+HostDirectory OpenHost(const std::string& dir, const StandIn::ChangeOptions& changes) {
+  HostDirectory host = dir.empty() ? OpenOwnHost(changes) : HostDirectory(dir);
+  host.SetChanges(changes);
+  return host;
 }
 
 }  // namespace SecPolicyTool

@@ -28,6 +28,7 @@ namespace {
 
 struct LabelArguments {
   std::string host;
+  StandIn::ChangeOptions changes;
   bool isJson = false;
   std::string path;
   std::string label;
@@ -152,7 +153,7 @@ ExitStatus RunSet(const LabelArguments& arguments) {
   Progress progress("Setting labels");
   // One operation sets one label; their lines are put together only for who is shown the progress.
   if (isatty(STDERR_FILENO) == 1) options.trace = [&](const std::string&) { progress.Step(); };
-  const auto session = EnterHost(arguments.host, options);
+  const auto session = EnterHost(arguments.host, options, arguments.changes);
   session->BeginBatch();
   try {
     SetLabels(arguments);
@@ -217,6 +218,7 @@ CommandLine SetVerb(const SharedLabelArguments& arguments) {
   verb.options.push_back({.names = {"-n", "--dry-run"},
                           .description = "Only show what would change",
                           .store = Into(arguments->isDryRun)});
+  AddChangeOptions(verb, arguments->changes);
   return verb;
 }
 

@@ -1,4 +1,4 @@
-// secpolicy load [--host DIR] [--trace] [--fail OPERATION[:N]] [POLICYDIR]
+// secpolicy load [--host DIR] [--wait SECONDS] [--trace] [--fail OPERATION[:N]] [POLICYDIR]
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -29,6 +29,7 @@ namespace {
 struct LoadArguments {
   std::string host;
   std::string policy;
+  StandIn::ChangeOptions changes;
   bool trace = false;
   std::vector<StandIn::Fault> faults;
 };
@@ -83,7 +84,7 @@ std::string WhatTheKernelHolds(bool isWritten) {
 }
 
 ExitStatus Load(const LoadArguments& arguments) {
-  StandIn::HostDirectory host = OpenHost(arguments.host);
+  StandIn::HostDirectory host = OpenHost(arguments.host, arguments.changes);
   const HostPaths paths(host);
   const StandIn::StateFile state(host);
   const StandIn::StateFile::Version before = state.CurrentVersion();
@@ -113,22 +114,25 @@ ExitStatus Load(const LoadArguments& arguments) {
 
 CommandLine LoadVerb() {
   const auto arguments = std::make_shared<LoadArguments>();
-  return {.name = "load",
-          .description = "Load a policy into a host's kernel",
-          .options = {HostOption(arguments->host),
-                      {.names = {"--trace"},
-                       .description = "Show every kernel operation",
-                       .store = Into(arguments->trace)},
-                      {.names = {"--fail"},
-                       .value = "OPERATION[:N]",
-                       .description = "Have the kernel refuse the N-th call (1) of an operation",
-                       .store =
-                           [arguments](const std::string& fault) {
-                             arguments->faults.push_back(StandIn::ParseFault(fault));
-                           },
-                       .isRepeatable = true}},
-          .operands = {OwnPolicyOperand(arguments->policy, "POLICYDIR")},
-          .run = [arguments] { return Load(*arguments); }};
+  CommandLine verb{
+      .name = "load",
+      .description = "Load a policy into a host's kernel",
+      .options = {HostOption(arguments->host),
+                  {.names = {"--trace"},
+                   .description = "Show every kernel operation",
+                   .store = Into(arguments->trace)},
+                  {.names = {"--fail"},
+                   .value = "OPERATION[:N]",
+                   .description = "Have the kernel refuse the N-th call (1) of an operation",
+                   .store =
+                       [arguments](const std::string& fault) {
+                         arguments->faults.push_back(StandIn::ParseFault(fault));
+                       },
+                   .isRepeatable = true}},
+      .operands = {OwnPolicyOperand(arguments->policy, "POLICYDIR")},
+      .run = [arguments] { return Load(*arguments); }};
+  AddChangeOptions(verb, arguments->changes);
+  return verb;
 }
 
 }  // namespace SecPolicyTool

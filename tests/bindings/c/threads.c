@@ -132,6 +132,13 @@ static void* Show(void* host) {
   return NULL;
 }
 
+static void* Load(void* argument) {
+  struct fixture* fixture = argument;
+  secpolicy_error* error = NULL;
+  CHECK_DONE(secpolicy_load(fixture->host, PolicyOf(fixture), NULL, &error), &error);
+  return NULL;
+}
+
 /* Waits until a thread of this process has a child. */
 static void AwaitChild(void) {
   const struct timespec moment = {.tv_nsec = 1000000};
@@ -154,7 +161,7 @@ static void ConnectionsAreClosedByTheirOwner(void) {
   const int lock = open(Below(&fixture.directory, "host/kernel.lock"), O_RDWR | O_CREAT, 0666);
   CHECK(lock >= 0 && fcntl(lock, F_OFD_SETLK, &whole) == 0);
   CHECK(pipe(ends) == 0);
-  CHECK(pthread_create(&thread, NULL, Show, fixture.host) == 0);
+  CHECK(pthread_create(&thread, NULL, Load, &fixture) == 0);
   AwaitChild();
   close(ends[1]);
   CHECK(read(ends[0], &byte, 1) == 0); /* and does not wait for the other thread's call */

@@ -285,7 +285,7 @@ TEST_F(AssembleTest, WhateverMomentACrashComesTheIndexIsRightOrMissing) {
 
 TEST_F(AssembleTest, WaitsForTheLock) {
   StateFile state(Host());
-  std::optional<StateFile::Lock> lock(std::in_place, state, LockMode::kShared);
+  std::optional<StateFile::Lock> lock(std::in_place, state);
   const pid_t child = StartChild([&] { Assemble(Host()); });
   std::this_thread::sleep_for(std::chrono::milliseconds(50));
   EXPECT_FALSE(Exists("root"));

@@ -21,11 +21,11 @@ void Pause(int milliseconds) {
 
 class StateFileTest : public HostFixture {
  protected:
-  // Whether anybody's lock would keep one of this mode waiting.
-  [[nodiscard]] bool IsLockedFor(LockMode mode) const {
+  // Whether anybody's lock would keep another one waiting.
+  [[nodiscard]] bool IsLocked() const {
     const UniqueFd fd(::open(Path("kernel.lock").c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0666));
     struct flock range {};
-    range.l_type = mode == LockMode::kShared ? F_RDLCK : F_WRLCK;
+    range.l_type = F_WRLCK;
     EXPECT_EQ(::fcntl(fd.Get(), F_OFD_GETLK, &range), 0);
     return range.l_type != F_UNLCK;
   }
@@ -34,7 +34,7 @@ class StateFileTest : public HostFixture {
   void Count(int times) const {
     StateFile state(Host());
     for (int i = 0; i < times; ++i) {
-      const StateFile::Lock lock(state, LockMode::kExclusive);
+      const StateFile::Lock lock(state);
       const int number = std::stoi(state.Read().value_or("0"));
       state.Write(std::to_string(number + 1));
     }
@@ -83,43 +83,36 @@ TEST_F(StateFileTest, ErrorsNameTheFile) {
   EXPECT_EQ(MessageOf<HostError>([&] { state_.Remove(); }),
             Path("kernel.json") + ": cannot be removed: Is a directory");
   std::filesystem::create_directory(Path("kernel.lock"));
-  EXPECT_EQ(MessageOf<HostError>([&] { StateFile::Lock lock(state_, LockMode::kExclusive); }),
+  EXPECT_EQ(MessageOf<HostError>([&] { StateFile::Lock lock(state_); }),
             Path("kernel.lock") + ": cannot be opened: Is a directory");
 }
 
-TEST_F(StateFileTest, ExclusiveLockKeepsEverybodyOut) {
+TEST_F(StateFileTest, LockIsHeldAsLongAsItsObjectLives) {
   {
-    const StateFile::Lock lock(state_, LockMode::kExclusive);
-    EXPECT_TRUE(IsLockedFor(LockMode::kShared));
-    EXPECT_TRUE(IsLockedFor(LockMode::kExclusive));
+    const StateFile::Lock lock(state_);
+    EXPECT_TRUE(IsLocked());
   }
-  EXPECT_FALSE(IsLockedFor(LockMode::kExclusive));
+  EXPECT_FALSE(IsLocked());
 }
 
-TEST_F(StateFileTest, SharedLocksKeepOnlyWritersOut) {
-  const StateFile::Lock first(state_, LockMode::kShared);
-  const StateFile::Lock second(state_, LockMode::kShared);
-  EXPECT_FALSE(IsLockedFor(LockMode::kShared));
-  EXPECT_TRUE(IsLockedFor(LockMode::kExclusive));
-}
-
-TEST_F(StateFileTest, WhoMayOnlyReadTakesASharedLock) {
-  { const StateFile::Lock made(state_, LockMode::kShared); }
-  std::filesystem::permissions(Path(), std::filesystem::perms(0555));
-  std::filesystem::permissions(Path("kernel.lock"), std::filesystem::perms(0444));
-  GiveToOrdinaryUser(Path() + "/..");
-  EXPECT_TRUE(PassesAsOrdinaryUser([&] {
-    const StateFile::Lock lock(state_, LockMode::kShared);
-    EXPECT_EQ(MessageOf<HostError>([&] { StateFile::Lock other(state_, LockMode::kExclusive); }),
-              Path("kernel.lock") + ": cannot be opened: Permission denied");
-  }));
-  std::filesystem::permissions(Path(), std::filesystem::perms(0755));
+TEST_F(StateFileTest, VersionIsThatOfWhatWasRead) {
+  StateFile other(Host());
+  other.Write("one");
+  EXPECT_EQ(state_.Read(), "one");
+  const StateFile::Version read = state_.LastVersion();
+  EXPECT_EQ(read, other.CurrentVersion());
+  other.Write("two");
+  EXPECT_EQ(state_.LastVersion(), read);
+  EXPECT_TRUE(state_.ChangedSince(read));
+  other.Remove();
+  EXPECT_EQ(state_.Read(), std::nullopt);
+  EXPECT_EQ(state_.LastVersion(), StateFile::Version());
 }
 
 TEST_F(StateFileTest, ParentAndChildWithOneStateFileExcludeEachOther) {
-  std::optional<StateFile::Lock> lock(std::in_place, state_, LockMode::kExclusive);
+  std::optional<StateFile::Lock> lock(std::in_place, state_);
   const pid_t child = StartChild([&] {
-    const StateFile::Lock own(state_, LockMode::kExclusive);
+    const StateFile::Lock own(state_);
     state_.Write("child");
   });
   Pause(50);
@@ -130,13 +123,13 @@ TEST_F(StateFileTest, ParentAndChildWithOneStateFileExcludeEachOther) {
 }
 
 TEST_F(StateFileTest, AChildsCopyOfALockGuardsNothing) {
-  std::optional<StateFile::Lock> lock(std::in_place, state_, LockMode::kExclusive);
+  std::optional<StateFile::Lock> lock(std::in_place, state_);
   EXPECT_TRUE(ChildPassed(StartChild([&] { lock.reset(); })));
-  EXPECT_TRUE(IsLockedFor(LockMode::kExclusive));
+  EXPECT_TRUE(IsLocked());
 
   const pid_t sleeper = StartChild([] { ::pause(); });
   lock.reset();
-  EXPECT_FALSE(IsLockedFor(LockMode::kExclusive));
+  EXPECT_FALSE(IsLocked());
   ::kill(sleeper, SIGKILL);
   EXPECT_FALSE(ChildPassed(sleeper));
 }
@@ -156,7 +149,7 @@ TEST_F(StateFileTest, AKilledWriterLeavesAWholeContent) {
   for (int round = 0; round < 20; ++round) {
     const pid_t writer = StartChild([&] {
       for (;;) {
-        const StateFile::Lock lock(state_, LockMode::kExclusive);
+        const StateFile::Lock lock(state_);
         state_.Write(contents[0]);
         state_.Write(contents[1]);
       }
@@ -164,7 +157,7 @@ TEST_F(StateFileTest, AKilledWriterLeavesAWholeContent) {
     Pause(1 + round);
     ::kill(writer, SIGKILL);
     EXPECT_FALSE(ChildPassed(writer));
-    EXPECT_FALSE(IsLockedFor(LockMode::kExclusive));
+    EXPECT_FALSE(IsLocked());
     const std::string content = state_.Read().value_or("");
     EXPECT_TRUE(content == contents[0] || content == contents[1]) << content.size();
   }

@@ -61,16 +61,26 @@ TEST_F(BatchTest, CommitWithoutABatchDoesNothing) {
   EXPECT_EQ(KeptModule(Host()).Domains(), "rootDom oldDom newDom");
 }
 
-TEST_F(BatchTest, OthersWaitUntilABatchIsCommitted) {
+TEST_F(BatchTest, OthersChangesWaitUntilABatchIsCommitted) {
   KeptModule kernel(Host());
   kernel.Keeper().BeginBatch();
   const pid_t child = StartChild([&] {
     KeptModule other(Host());
-    EXPECT_EQ(other.Domains(), "rootDom oldDom newDom");
+    other.Create("otherDom");
+    EXPECT_EQ(other.Domains(), "rootDom oldDom newDom otherDom");
   });
   kernel.Create("newDom");
   kernel.Keeper().Commit();
   EXPECT_TRUE(ChildPassed(child));
+}
+
+TEST_F(BatchTest, WhoReadsDuringABatchSeesWhatWasBefore) {
+  KeptModule kernel(Host());
+  kernel.Keeper().BeginBatch();
+  kernel.Create("newDom");
+  EXPECT_EQ(KeptModule(Host()).Domains(), "rootDom oldDom");
+  kernel.Keeper().Commit();
+  EXPECT_EQ(KeptModule(Host()).Domains(), "rootDom oldDom newDom");
 }
 
 }  // namespace

@@ -133,7 +133,7 @@ TEST_F(StateKeeperTest, WhatARefusedOperationDidIsKept) {
 TEST_F(StateKeeperTest, OperationsOutsideTheStateNeedNoLock) {
   KeptModule kernel(Host());
   StateFile other(Host());
-  const StateFile::Lock lock(other, LockMode::kExclusive);
+  const StateFile::Lock lock(other);
   EXPECT_EQ(kernel.Module().MaxDomains(), 1024u);  // would wait for ever
 }
 
