@@ -2,6 +2,7 @@
 
 #include <fcntl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -28,33 +29,38 @@ namespace {
 constexpr mode_t kSharedDirectoryMode = 0755;
 constexpr mode_t kArchiveCopyMode = 0644;
 
-// The names of the archives in byte order.
+bool IsRegularFile(int fd, const std::string& file) {
+  struct stat status;
+  if (::fstat(fd, &status) != 0) throw SystemFailure(file, "read", errno);
+  return S_ISREG(status.st_mode);
+}
+
+[[noreturn]] void RefuseOthers(const DirectoryRef& archives, const std::string& names) {
+  throw HostError(archives.path + ": not a regular file: " + names);
+}
+
+// The names of the archives in byte order. All that are not files are named together; what is
+// unpacked in the end is looked at once more, when it is open.
 std::vector<std::string> ArchiveNames(const DirectoryRef& archives) {
   std::vector<std::string> names = ListDirectory(archives);
   std::sort(names.begin(), names.end());
   std::string others;
   for (const std::string& name : names) {
-    struct stat status;
-    if (::fstatat(archives.fd, name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
-      const int number = errno;
-      throw SystemFailure(archives.PathOf(name), "read", number);
-    }
-    if (!S_ISREG(status.st_mode)) {
+    const UniqueFd fd(::openat(archives.fd, name.c_str(), O_PATH | O_NOFOLLOW | O_CLOEXEC));
+    if (!fd.IsOpen()) throw SystemFailure(archives.PathOf(name), "read", errno);
+    if (!IsRegularFile(fd.Get(), archives.PathOf(name))) {
       others += (others.empty() ? "" : ", ") + QuotedName(name);
     }
   }
-  if (!others.empty()) {
-    throw HostError(archives.path + ": not a regular file: " + others);
-  }
+  if (!others.empty()) RefuseOthers(archives, others);
   return names;
 }
 
 UniqueFd OpenArchive(const DirectoryRef& archives, const std::string& name) {
-  UniqueFd fd(::openat(archives.fd, name.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
-  if (!fd.IsOpen()) {
-    const int number = errno;
-    throw SystemFailure(archives.PathOf(name), "opened", number);
-  }
+  UniqueFd fd(::openat(archives.fd, name.c_str(),
+                       O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
+  if (!fd.IsOpen()) throw SystemFailure(archives.PathOf(name), "opened", errno);
+  if (!IsRegularFile(fd.Get(), archives.PathOf(name))) RefuseOthers(archives, QuotedName(name));
   return fd;
 }
 
@@ -68,9 +74,8 @@ class NewRoot {
       throw SystemFailure(host_.PathOf(kNewRootDirectory), "made", number);
     }
     fd_ = OpenDirectory(host_, kNewRootDirectory);
-    const TreeWriter tree = Writer();
-    tree.SetDirectoryMode("/", kSharedDirectoryMode);
-    tree.MakeDirectory(kArchivesPath, kSharedDirectoryMode);
+    RequireOwn();
+    Writer().MakeDirectory(kArchivesPath, kSharedDirectoryMode);
   }
   ~NewRoot() {
     try {
@@ -86,15 +91,17 @@ class NewRoot {
     return TreeWriter({fd_.Get(), host_.PathOf(kNewRootDirectory)});
   }
 
-  void AddArchive(const DirectoryRef& archives, const std::string& name) const {
+  // `archive` is the file of that name, open.
+  void AddArchive(const UniqueFd& archive, const std::string& shown,
+                  const std::string& name) const {
     const std::string path = std::string(kArchivesPath) + "/" + name;
-    if (::linkat(archives.fd, name.c_str(), fd_.Get(), path.c_str() + 1, 0) != 0) {
-      CopyArchive(archives, name, path);
-    }
+    if (!Writer().LinkFile(archive.Get(), path)) CopyArchive(archive, shown, path);
   }
 
   // Exchanges it with the root file system that is there, which vanishes in its stead.
   void PutIntoPlace() const {
+    // Until now nobody else could enter it, whatever permissions the directories in it have.
+    Writer().SetDirectoryMode("/", kSharedDirectoryMode);
     const bool isSynced = ::syncfs(fd_.Get()) == 0;
     const bool isPlaced = isSynced && (Rename(RENAME_EXCHANGE) || (errno == ENOENT && Rename(0)));
     if (!isPlaced) {
@@ -111,12 +118,23 @@ class NewRoot {
     return ::renameat2(host_.fd, kNewRootDirectory, host_.fd, kRootDirectory, flags) == 0;
   }
 
-  void CopyArchive(const DirectoryRef& archives, const std::string& name,
+  // Whether what is open is the directory just made, which another process may have exchanged.
+  void RequireOwn() const {
+    struct stat status;
+    if (::fstat(fd_.Get(), &status) != 0) {
+      throw SystemFailure(host_.PathOf(kNewRootDirectory), "read", errno);
+    }
+    if (status.st_uid != ::geteuid() || (status.st_mode & (S_IRWXG | S_IRWXO)) != 0) {
+      throw HostError(host_.PathOf(kNewRootDirectory) + ": was exchanged by another process");
+    }
+  }
+
+  void CopyArchive(const UniqueFd& archive, const std::string& shown,
                    const std::string& path) const {
-    const UniqueFd source = OpenArchive(archives, name);
+    if (::lseek(archive.Get(), 0, SEEK_SET) != 0) throw SystemFailure(shown, "read", errno);
     NewFile copy = Writer().MakeFile(path);
     std::uint64_t size = 0;
-    ReadBlocks(source.Get(), archives.PathOf(name), [&](std::string_view block) {
+    ReadBlocks(archive.Get(), shown, [&](std::string_view block) {
       copy.WriteAt(size, block);
       size += block.size();
     });
@@ -140,7 +158,7 @@ ImageIndex UnpackAll(const DirectoryRef& archives, const NewRoot& root, const Un
       shown = archives.PathOf(name);
       const UniqueFd fd = OpenArchive(archives, name);
       const std::uint64_t entries = Unpack({fd.Get(), name, shown}, budget, layout, tree);
-      root.AddArchive(archives, name);
+      root.AddArchive(fd, shown, name);
       report.tardisks.push_back({name, entries});
       report.entries += entries;
     }
@@ -165,6 +183,7 @@ AssembleReport Assemble(const HostDirectory& host, const UnpackLimits& limits) {
   const StateFile::Lock lock(state);
   const UniqueFd fd = OpenDirectory(host.Ref(), kTardiskDirectory);
   const DirectoryRef archives{fd.Get(), host.Ref().PathOf(kTardiskDirectory)};
+  if (host.Changes().otherWriters == OtherWriters::kRefused) RequireNoOtherWriters(archives);
 
   AssembleReport report;
   const NewRoot root(host);

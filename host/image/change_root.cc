@@ -110,8 +110,10 @@ void PutInPlace(const VisibleTree& visible) {
   std::error_code error;
   std::filesystem::create_directories(visible.path, error);
   if (error) throw SystemFailure(visible.path, "made in the host's root", error.value());
-  if (move_mount(visible.tree.Get(), "", AT_FDCWD, visible.path.c_str(), MOVE_MOUNT_F_EMPTY_PATH) !=
-      0) {
+  const UniqueFd place(open(visible.path.c_str(), O_PATH | O_DIRECTORY | O_CLOEXEC));
+  if (!place.IsOpen()) throw SystemFailure(visible.path, "made visible in the host", errno);
+  if (move_mount(visible.tree.Get(), "", place.Get(), "",
+                 MOVE_MOUNT_F_EMPTY_PATH | MOVE_MOUNT_T_EMPTY_PATH) != 0) {
     throw SystemFailure(visible.path, "made visible in the host", errno);
   }
 }

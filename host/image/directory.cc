@@ -2,6 +2,8 @@
 
 #include <dirent.h>
 #include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <memory>
@@ -53,6 +55,18 @@ std::vector<std::string> ListDirectory(const DirectoryRef& dir) {
     throw SystemFailure(dir.path, "read", errno);
   }
   return names;
+}
+
+void RequireNoOtherWriters(const DirectoryRef& dir) {
+  if (::geteuid() != 0) return;
+  struct stat status;
+  if (::fstat(dir.fd, &status) != 0) throw SystemFailure(dir.path, "read", errno);
+  const bool isGroups = (status.st_mode & S_IWGRP) != 0 && status.st_gid != 0;
+  if (status.st_uid != 0 || isGroups || (status.st_mode & S_IWOTH) != 0) {
+    throw HostError(dir.path +
+                    ": users other than root can write to this directory; with "
+                    "\"--trust-other-writers\" root works in it all the same");
+  }
 }
 
 }  // namespace StandIn

@@ -25,4 +25,9 @@ UniqueFd OpenDirectory(const DirectoryRef& dir, const std::string& name);
 // read: REASON".
 std::vector<std::string> ListDirectory(const DirectoryRef& dir);
 
+// For root: nobody else may exchange what is in `dir` under its hands. Does nothing for other
+// users. Throws HostError "DIR: users other than root can write to this directory; with
+// "--trust-other-writers" root works in it all the same".
+void RequireNoOtherWriters(const DirectoryRef& dir);
+
 }  // namespace StandIn

@@ -66,6 +66,11 @@ class TemporaryFile {
     return 0;
   }
 
+  // EEXIST when something has the name already. The temporary name vanishes with this object.
+  int TakeFreeName(const std::string& finalName) {
+    return ::linkat(dirFd_, name_.c_str(), dirFd_, finalName.c_str(), 0) == 0 ? 0 : errno;
+  }
+
  private:
   int dirFd_;
   std::string name_;
@@ -133,8 +138,12 @@ std::string ReadFile(const DirectoryRef& dir, const std::string& name) {
   return *std::move(text);
 }
 
-void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
-                 Writers writers) {
+namespace {
+
+// False when the name has to be free and is not.
+enum class Existing { kReplaced, kStays };
+bool PutFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
+             Writers writers, Existing existing) {
   const auto check = [&](int number) {
     if (number != 0) {
       throw SystemFailure(dir.PathOf(name), "written", number);
@@ -146,8 +155,25 @@ void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::st
   TemporaryFile file(directory.Get(), NameInTheMaking(name, writers));
   check(file.Make());
   check(file.Fill(text));
-  check(file.TakeName(name));
+  const bool isReplaced = existing == Existing::kReplaced;
+  const int taken = isReplaced ? file.TakeName(name) : file.TakeFreeName(name);
+  if (!isReplaced && taken == EEXIST) {
+    return false;
+  }
+  check(taken);
   check(::fsync(directory.Get()) == 0 ? 0 : errno);
+  return true;
+}
+
+}  // namespace
+
+bool MakeFileIfMissing(const DirectoryRef& dir, const std::string& name, const std::string& text) {
+  return PutFile(dir, name, text, Writers::kSeveral, Existing::kStays);
+}
+
+void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
+                 Writers writers) {
+  PutFile(dir, name, text, writers, Existing::kReplaced);
 }
 
 }  // namespace StandIn

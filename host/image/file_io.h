@@ -37,6 +37,10 @@ enum class Writers {
   kOne,      // nobody: a lock sees to that
 };
 
+// Makes the file `name` in `dir`, whole and synced as below; false when something has that name
+// already, which stays. Throws HostError as below.
+bool MakeFileIfMissing(const DirectoryRef& dir, const std::string& name, const std::string& text);
+
 // Gives the file `name` in `dir` the content `text`: as a new file, which is synced and then takes
 // the name, whereupon the directory is synced. Whoever reads the name sees the old content or the
 // new one whole, also when this process or the machine stops at any moment. What a process that was

@@ -54,7 +54,10 @@ void HostDirectory::Create(const std::string& path, const std::string& descripti
     const int number = errno;
     throw SystemFailure(names.PathOf(kTardiskDirectory), "made", number);
   }
-  ReplaceFile({fd.Get(), names.path}, kDescriptionFile, descriptionText);
+  // Another process may have made one meanwhile.
+  if (!MakeFileIfMissing({fd.Get(), names.path}, kDescriptionFile, descriptionText)) {
+    throw HostError(names.path + " is a host directory already");
+  }
 }
 
 HostDirectory::HostDirectory(const std::string& path)

@@ -21,9 +21,13 @@ inline constexpr char kLockFile[] = "kernel.lock";       // held by whoever chan
 // How long whoever changes a host waits for another one to end, unless told otherwise.
 inline constexpr std::chrono::seconds kLockWait(30);
 
+// Whether root changes a host in which another user can exchange files under its hands.
+enum class OtherWriters { kRefused, kTrusted };
+
 // How a host is changed.
 struct ChangeOptions {
   std::chrono::seconds wait = kLockWait;  // for the host's lock
+  OtherWriters otherWriters = OtherWriters::kRefused;
 };
 
 // An open host directory. Everything in it is reached through one descriptor, so that it stays

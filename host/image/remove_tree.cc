@@ -7,6 +7,7 @@
 #include <cstdio>
 #include <vector>
 
+#include "host/image/beneath.h"
 #include "host/image/system_failure.h"
 #include "host/image/unique_fd.h"
 
@@ -17,16 +18,17 @@ namespace {
 // Empties a directory without recursion, which would need a descriptor for each level of a tree
 // that may have thousands: a directory met within another one is moved to the top and dealt with
 // there.
+//
+// Another process may exchange entries meanwhile. So nothing is asked about a name before it is
+// used: a call is made for the one kind of entry, and when the kernel says that the entry is of the
+// other kind, the call for that one. No call follows a link or passes into another file system.
 class TreeRemover {
  public:
   TreeRemover(const DirectoryRef& dir, const std::string& name)
       : dir_(dir), name_(name), shown_(dir.PathOf(name)) {}
 
   void Run() {
-    if (!IsDirectory(dir_.fd, name_)) {
-      Unlink(dir_.fd, name_);
-      return;
-    }
+    if (Unlink(dir_.fd, name_) == Left::kNothing) return;
     top_ = OpenForRemoval(dir_.fd, name_);
     for (std::vector<std::string> found = Names(top_.Get()); !found.empty();
          found = Names(top_.Get())) {
@@ -38,57 +40,63 @@ class TreeRemover {
   }
 
  private:
+  enum class Left { kNothing, kDirectory };
+
   void RemoveTopEntry(const std::string& entry) {
-    if (!IsDirectory(top_.Get(), entry)) {
-      Unlink(top_.Get(), entry);
-      return;
-    }
+    if (Unlink(top_.Get(), entry) == Left::kNothing) return;
     const UniqueFd directory = OpenForRemoval(top_.Get(), entry);
     for (const std::string& inner : Names(directory.Get())) {
-      if (IsDirectory(directory.Get(), inner)) {
-        MoveToTop(directory.Get(), inner);
-      } else {
-        Unlink(directory.Get(), inner);
-      }
+      if (Unlink(directory.Get(), inner) == Left::kDirectory) MoveToTop(directory.Get(), inner);
     }
     Check(::unlinkat(top_.Get(), entry.c_str(), AT_REMOVEDIR));
   }
 
   void MoveToTop(int from, const std::string& inner) {
-    MakeAccessible(from, inner);  // moving it changes its "..", which takes the right to write it
-    for (;;) {
+    for (bool isAccessible = false;;) {
       const std::string fresh = ".removed." + std::to_string(++moved_);
       if (::renameat(from, inner.c_str(), top_.Get(), fresh.c_str()) == 0) {
         return;
+      }
+      if (errno == EACCES && !isAccessible) {
+        // Moving a directory changes its "..", which takes the right to write it.
+        isAccessible = true;
+        static_cast<void>(OpenForRemoval(from, inner));
+        continue;
       }
       const bool isTaken = errno == ENOTEMPTY || errno == EEXIST || errno == ENOTDIR;
       Check(isTaken ? 0 : -1);
     }
   }
 
+  // Removes anything but a directory.
+  Left Unlink(int at, const std::string& name) {
+    if (::unlinkat(at, name.c_str(), 0) == 0 || errno == ENOENT) return Left::kNothing;
+    Check(errno == EISDIR ? 0 : -1);
+    return Left::kDirectory;
+  }
+
+  // Opens the directory `name` for reading and changing, with other permissions where its own
+  // forbid that.
   UniqueFd OpenForRemoval(int at, const std::string& name) {
-    MakeAccessible(at, name);
-    UniqueFd fd(::openat(at, name.c_str(), O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC));
-    Check(fd.Get());
-    return fd;
+    const std::string path = "/" + name;
+    const UniqueFd directory = OpenBeneath(at, path, O_PATH | O_DIRECTORY | O_NOFOLLOW);
+    Check(directory.Get());
+    UniqueFd readable = OpenBeneath(directory.Get(), "/", O_RDONLY | O_DIRECTORY);
+    const bool isReadable =
+        readable.IsOpen() && ::faccessat(readable.Get(), ".", W_OK | X_OK, AT_EACCESS) == 0;
+    if (isReadable) return readable;
+    ChangeMode(directory.Get());
+    readable = OpenBeneath(directory.Get(), "/", O_RDONLY | O_DIRECTORY);
+    Check(readable.Get());
+    return readable;
   }
 
-  void MakeAccessible(int at, const std::string& name) {
-    Check(::fchmodat(at, name.c_str(), S_IRWXU, 0));
-  }
-
-  bool IsDirectory(int at, const std::string& name) {
-    struct stat status {};
-    if (::fstatat(at, name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
-      Check(errno == ENOENT ? 0 : -1);
-    }
-    return S_ISDIR(status.st_mode);
-  }
-
-  void Unlink(int at, const std::string& name) {
-    if (::unlinkat(at, name.c_str(), 0) != 0) {
-      Check(errno == ENOENT ? 0 : -1);
-    }
+  // There is no call for a descriptor that was opened with O_PATH, which alone can be had of a
+  // directory that may not be read. The path stands for what the descriptor is open on, and for
+  // nothing else.
+  void ChangeMode(int directory) {
+    const std::string self = "/proc/self/fd/" + std::to_string(directory);
+    Check(::chmod(self.c_str(), S_IRWXU));
   }
 
   [[nodiscard]] std::vector<std::string> Names(int directory) const {

@@ -26,6 +26,9 @@ class RootIndex {
   // cannot be opened: REASON" and the errors of ReadImage.
   static std::optional<RootIndex> Load(const HostDirectory& host);
 
+  // The descriptor of root/, valid as long as this object.
+  [[nodiscard]] int Root() const { return root_.Get(); }
+
   // The path within the root file system of the file with these numbers, beginning with "/"; of
   // several hard links the first in byte order. Nothing when the image has no such file.
   [[nodiscard]] std::optional<std::string> PathOf(dev_t device, ino_t inode) const;

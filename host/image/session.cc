@@ -52,8 +52,7 @@ Session::Session(HostDirectory host, const SessionOptions& options)
   if (isKept_) point_.Add(keeper_);
   if (options.trace) point_.Add(trace_);
   if (!options.faults.empty()) point_.Add(faults_);
-  const UniqueFd root = OpenDirectory(host_.Ref(), kRootDirectory);
-  ChangeRoot({root.Get(), host_.Ref().PathOf(kRootDirectory)}, options.visible);
+  ChangeRoot({files_.Root(), host_.Ref().PathOf(kRootDirectory)}, options.visible);
   for (const std::string& path : options.visible) attached_.visible.push_back(WithoutLinks(path));
   EnterGate();
   Attach(&attached_);

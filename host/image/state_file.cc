@@ -128,6 +128,7 @@ bool IsNamed(const DirectoryRef& dir, int fd) {
 // child that share it would not exclude each other either. Opened anew for each Lock, it excludes
 // everybody whatever forked when.
 StateFile::Lock::Lock(const StateFile& state) : owner_(::getpid()) {
+  if (state.changes_.otherWriters == OtherWriters::kRefused) RequireNoOtherWriters(state.dir_);
   do {
     fd_ = OpenLockFile(state.dir_);
     AwaitLock(fd_.Get(), state.dir_.PathOf(kLockFile), state.changes_.wait);

@@ -35,6 +35,7 @@ class StateFile {
   class Lock {
    public:
     // Waits until the lock is free, but no longer than `changes.wait`. Throws HostError
+    //   that of RequireNoOtherWriters for the host directory, unless they are trusted
     //   "DIR/kernel.lock: cannot be opened: REASON", "...: cannot be locked: REASON"
     //   "DIR/kernel.lock: not a regular file"
     //   "DIR/kernel.lock: has other names, which are not this host's"

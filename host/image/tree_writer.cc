@@ -94,7 +94,15 @@ void TreeWriter::MakeSymlink(const std::string& path, const std::string& target)
 void TreeWriter::MakeFifo(const std::string& path, mode_t mode) const {
   const Place place = Locate(path);
   place.Check(::mkfifoat(place.directory.Get(), place.name.c_str(), S_IRUSR | S_IWUSR), "made");
-  place.Check(::fchmodat(place.directory.Get(), place.name.c_str(), mode & kRights, 0), "made");
+  // Opened for both, a fifo doesn't wait for another process.
+  const UniqueFd fifo(::openat(place.directory.Get(), place.name.c_str(),
+                               O_RDWR | O_NONBLOCK | O_NOCTTY | O_NOFOLLOW | O_CLOEXEC));
+  place.Check(fifo.Get(), "opened");
+  struct stat status;
+  place.Check(::fstat(fifo.Get(), &status), "read");
+  if (!S_ISFIFO(status.st_mode))
+    throw HostError(place.shown + ": was exchanged by another process");
+  place.Check(::fchmod(fifo.Get(), mode & kRights), "made");
 }
 
 void TreeWriter::MakeHardLink(const std::string& path, const std::string& target) const {
@@ -103,6 +111,14 @@ void TreeWriter::MakeHardLink(const std::string& path, const std::string& target
   to.Check(
       ::linkat(from.directory.Get(), from.name.c_str(), to.directory.Get(), to.name.c_str(), 0),
       "made");
+}
+
+// By the descriptor, so that the file is the one that was read whatever its name stands for now.
+bool TreeWriter::LinkFile(int fd, const std::string& path) const {
+  const Place place = Locate(path);
+  const std::string self = "/proc/self/fd/" + std::to_string(fd);
+  return ::linkat(AT_FDCWD, self.c_str(), place.directory.Get(), place.name.c_str(),
+                  AT_SYMLINK_FOLLOW) == 0;
 }
 
 NewFile TreeWriter::MakeFile(const std::string& path) const {

@@ -27,10 +27,12 @@ class NewFile {
   std::string shown_;
 };
 
-// Makes files below a directory; never passes a symbolic link on the way. Paths begin with "/",
-// which stands for that directory. What is made must not be there yet, the directory above it must.
-// Permissions are the mode's low nine bits whatever the process's mask, and directories have those
-// of their owner in any case. All functions throw HostError "ROOT/PATH: cannot be DONE: REASON".
+// Makes files below a directory. Never passes a symbolic link on the way nor follows one at its
+// end, and changes permissions by descriptors alone, whatever other processes exchange meanwhile.
+// Paths begin with "/", which stands for that directory. What is made must not be there yet, the
+// directory above it must. Permissions are the mode's low nine bits whatever the process's mask,
+// and directories have those of their owner in any case. All functions throw HostError "ROOT/PATH:
+// cannot be DONE: REASON".
 class TreeWriter {
  public:
   explicit TreeWriter(DirectoryRef root);
@@ -40,6 +42,9 @@ class TreeWriter {
   void MakeSymlink(const std::string& path, const std::string& target) const;
   void MakeFifo(const std::string& path, mode_t mode) const;
   void MakeHardLink(const std::string& path, const std::string& target) const;
+  // Gives the open file `fd` the name `path`; false where it cannot have one there: it lies in
+  // another file system, or the kernel forbids names for files of others.
+  [[nodiscard]] bool LinkFile(int fd, const std::string& path) const;
   [[nodiscard]] NewFile MakeFile(const std::string& path) const;
   // Anything but a directory.
   void Remove(const std::string& path) const;

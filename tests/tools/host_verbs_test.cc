@@ -128,6 +128,20 @@ TEST_F(HostVerbsTest, AFifoInPlaceOfTheLockHoldsNobodyUp) {
   Done({"host", "info", Host()});
 }
 
+TEST_F(HostVerbsTest, RootWorksWhereOthersWriteOnlyWhenToldSo) {
+  if (::getuid() != 0) GTEST_SKIP() << "another user is not held back";
+  MakeHost();
+  ASSERT_EQ(::chmod(Host().c_str(), 0777), 0);
+  const std::string error = "Error: " + Host() +
+                            ": users other than root can write to this directory; with "
+                            "\"--trust-other-writers\" root works in it all the same\n";
+  EXPECT_EQ(Command({"host", "assemble", Host()}).err, error);
+  EXPECT_THAT(Command({"load", "--host", Host(), PolicyDir()}).err, HasSubstr(error));
+  EXPECT_EQ(Command({"domain", "create", "--host", Host(), "newDom"}).err, error);
+  Done({"host", "assemble", "--trust-other-writers", Host()});
+  Done({"domain", "create", "--host", Host(), "--trust-other-writers", "newDom"});
+}
+
 TEST_F(HostVerbsTest, TheWaitIsANumberOfSeconds) {
   for (const char* wait : {"-1", "x", "1.5", "86401"}) {
     EXPECT_EQ(Command({"host", "assemble", "--wait", wait, Host()}).status, 2) << wait;

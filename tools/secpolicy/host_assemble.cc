@@ -1,4 +1,4 @@
-// secpolicy host assemble [--wait SECONDS] DIR
+// secpolicy host assemble [--wait SECONDS] [--trust-other-writers] DIR
 #include <iostream>
 #include <memory>
 

@@ -80,6 +80,12 @@ void AddChangeOptions(CommandLine& verb, StandIn::ChangeOptions& changes) {
                                     std::chrono::seconds(WholeNumber(text, 0, kLongestWait));
                               },
                           .defaultValue = std::to_string(StandIn::kLockWait.count())});
+  verb.options.push_back(
+      {.names = {"--trust-other-writers"},
+       .description = "As root, work also in a directory that other users can write to",
+       .store = [&changes](const std::string&) {
+         changes.otherWriters = StandIn::OtherWriters::kTrusted;
+       }});
 }
 
 HostDirectory OpenHost(const std::string& dir, const StandIn::ChangeOptions& changes) {

@@ -17,7 +17,7 @@ CommandOption HostOperand(std::string& dir, const std::string& description);
 // "--json"; docs/schemas/VERB.schema.json describes what is printed.
 CommandOption JsonOption(bool& isJson);
 
-// "--wait SECONDS", for a verb that changes a host.
+// "--wait SECONDS" and "--trust-other-writers", for a verb that changes a host.
 void AddChangeOptions(CommandLine& verb, StandIn::ChangeOptions& changes);
 
 // The host directory `dir`; when that is empty, the user's own one, which is made, with the default

@@ -113,7 +113,7 @@ void GiveToOrdinaryUser(const std::string& path) {
 
 ChildResult RunOnSmallFileSystem(const std::string& path, std::size_t bytes,
                                  const std::function<void()>& body) {
-  const std::string options = "size=" + std::to_string(bytes);
+  const std::string options = "mode=0755,size=" + std::to_string(bytes);
   return RunMounted([&] { return ::mount("none", path.c_str(), "tmpfs", 0, options.c_str()) == 0; },
                     body);
 }

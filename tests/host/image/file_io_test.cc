@@ -164,5 +164,14 @@ TEST(UniqueFdTest, GivesItsDescriptorAway) {
   const UniqueFd closer(number);
 }
 
+TEST_F(FileIoTest, AFileThatIsMissingIsMadeAndOneThatIsThereStays) {
+  EXPECT_TRUE(MakeFileIfMissing(Ref(), "f", "one"));
+  EXPECT_FALSE(MakeFileIfMissing(Ref(), "f", "two"));
+  EXPECT_EQ(ReadFile(Ref(), "f"), "one");
+  ASSERT_EQ(::symlink("nowhere", Path("link").c_str()), 0);
+  EXPECT_FALSE(MakeFileIfMissing(Ref(), "link", "two"));
+  EXPECT_THAT(NamesIn(Path("")), testing::UnorderedElementsAre("f", "link"));
+}
+
 }  // namespace
 }  // namespace StandIn

@@ -97,7 +97,7 @@ TEST_F(RemoveTreeTest, WhatMayNotBeRemovedIsNamed) {
   }
   EXPECT_TRUE(PassesAsOrdinaryUser([&] {
     EXPECT_EQ(MessageOf<HostError>([&] { RemoveTree(ref_, "tree"); }),
-              "D/tree: cannot be removed: Operation not permitted");
+              "D/tree: cannot be removed: Permission denied");
   }));
   EXPECT_TRUE(std::filesystem::exists(directory_ / "tree/a"));
 }

@@ -59,7 +59,8 @@ TEST_F(CompletionTest, BashOffersTheVerbs) {
 
 TEST_F(CompletionTest, BashOffersTheVerbsOptions) {
   EXPECT_THAT(Bash({"load", "--"}),
-              UnorderedElementsAre("--help", "--host", "--wait", "--trace", "--fail"));
+              UnorderedElementsAre("--help", "--host", "--wait", "--trust-other-writers", "--trace",
+                                   "--fail"));
   EXPECT_THAT(Bash({"label", "set", "--d"}), ElementsAre("--dry-run"));
 }
 
