@@ -3,7 +3,7 @@
 #include <string_view>
 
 #include "bindings/c/failure.h"
-#include "tools/policy/utf8_text.h"
+#include "host/text/utf8_text.h"
 
 namespace SecPolicyC {
 
@@ -22,7 +22,7 @@ void RequireSet(const void* argument, const char* name) {
 std::string TextOf(const char* argument, const char* name) {
   RequireSet(argument, name);
   std::string text = argument;
-  if (SecPolicyTool::ValidText(text) != text) Refuse(name, "not UTF-8");
+  if (StandIn::ValidText(text) != text) Refuse(name, "not UTF-8");
   return text;
 }
 

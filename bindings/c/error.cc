@@ -3,7 +3,7 @@
 #include <string>
 
 #include "bindings/c/barrier.h"
-#include "tools/policy/utf8_text.h"
+#include "host/text/utf8_text.h"
 
 struct secpolicy_error {
   secpolicy_status status;
@@ -23,8 +23,8 @@ secpolicy_status Store(const Failure& failure, secpolicy_error** error) {
   const secpolicy_status status = failure.status;
   if (error != nullptr) {
     // Messages name files and words as they are, which may be any bytes.
-    *error = new secpolicy_error{status, SecPolicyTool::ValidText(failure.message),
-                                 SecPolicyTool::ValidText(failure.file), failure.line};
+    *error = new secpolicy_error{status, StandIn::ValidText(failure.message),
+                                 StandIn::ValidText(failure.file), failure.line};
   }
   return status;
 }

@@ -4,9 +4,9 @@
 #include <utility>
 
 #include "bindings/c/text.h"
+#include "host/text/utf8_text.h"
 #include "tools/policy/policy_json.h"
 #include "tools/policy/policy_source.h"
-#include "tools/policy/utf8_text.h"
 #include "tools/requests/questions.h"
 #include "tools/requests/search_request.h"
 
@@ -32,7 +32,7 @@ Fields ReadPolicy(const std::string& hostPath, const std::string& source) {
       SecPolicyTool::ReadSource(HostDirectory(hostPath), source);
   Fields fields(1);
   json::to_cbor(SecPolicyTool::ToJson(read.policy), fields[0]);
-  for (const std::string& error : read.errors) fields.push_back(SecPolicyTool::ValidText(error));
+  for (const std::string& error : read.errors) fields.push_back(StandIn::ValidText(error));
   return fields;
 }
 

@@ -15,12 +15,12 @@
 #include "host/image/file_io.h"
 #include "host/image/image_index.h"
 #include "host/image/image_layout.h"
-#include "host/image/quoted_name.h"
 #include "host/image/remove_tree.h"
 #include "host/image/state_file.h"
 #include "host/image/system_failure.h"
 #include "host/image/tree_writer.h"
 #include "host/image/unpack.h"
+#include "host/text/quoted_name.h"
 
 namespace StandIn {
 

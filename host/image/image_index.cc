@@ -4,9 +4,9 @@
 #include <unordered_set>
 
 #include "host/image/entry_path.h"
-#include "host/image/quoted_name.h"
 #include "host/json/json_cursor.h"
 #include "host/json/json_writer.h"
+#include "host/text/quoted_name.h"
 
 namespace StandIn {
 

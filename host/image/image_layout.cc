@@ -3,7 +3,7 @@
 #include <algorithm>
 
 #include "host/image/entry_path.h"
-#include "host/image/quoted_name.h"
+#include "host/text/quoted_name.h"
 
 namespace StandIn {
 

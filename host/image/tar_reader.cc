@@ -10,7 +10,7 @@
 #include <new>
 #include <utility>
 
-#include "host/image/quoted_name.h"
+#include "host/text/quoted_name.h"
 
 namespace StandIn {
 

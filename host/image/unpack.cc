@@ -4,8 +4,8 @@
 #include <utility>
 
 #include "host/image/entry_path.h"
-#include "host/image/quoted_name.h"
 #include "host/image/tar_reader.h"
+#include "host/text/quoted_name.h"
 
 namespace StandIn {
 

@@ -6,6 +6,8 @@
 #include <set>
 #include <string_view>
 
+#include "host/text/escaped.h"
+#include "host/text/quoted_name.h"
 #include "platform/tavon_strcat.h"
 #include "secpolicy/host/host_error.h"
 
@@ -34,7 +36,8 @@ class ParseGuard {
     } else if (event == json::parse_event_t::key) {
       const auto& key = parsed.get_ref<const std::string&>();
       if (!keys_.back().insert(key).second) {
-        throw HostError(StrCat(file_, ": gives the member \"", key, "\" of one object twice"));
+        throw HostError(
+            StrCat(file_, ": gives the member ", QuotedName(key), " of one object twice"));
       }
     }
     return true;
@@ -57,7 +60,7 @@ std::string LineAndColumn(std::string_view text, std::size_t bytes) {
 std::string Cause(const json::exception& error, std::string_view prefix) {
   const std::string text = error.what();
   const std::size_t found = text.find(prefix);
-  return found == std::string::npos ? text : text.substr(found + prefix.size());
+  return Escaped(found == std::string::npos ? text : text.substr(found + prefix.size())).Text();
 }
 
 // Appends to `place` the place of `sought` within `value`; says whether it is there. Places are
@@ -182,7 +185,8 @@ bool JsonCursor::IsString() const { return value_->is_string(); }
 void JsonCursor::Fail(const std::string& what) const {
   json::json_pointer place;
   FindPlace(*document_, *value_, place);
-  const std::string text = place.to_string();
+  // Keys are from outside; a NUL in one would end the message.
+  const std::string text = Escaped(place.to_string()).Text();
   throw HostError(StrCat(*file_, ": ", text.empty() ? "/" : text, ": ", what));
 }
 

@@ -8,6 +8,7 @@
 #include "host/module/state_fields.h"
 #include "host/module/state_json.h"
 #include "host/module/state_rows.h"
+#include "host/text/quoted_name.h"
 #include "platform/tavon_strcat.h"
 
 namespace StandIn {
@@ -72,7 +73,7 @@ void ReadDomains(const JsonCursor& document, DomainTable& domains) {
       place.Member("id").Fail(StrCat("the id ", id, " is taken"));
     }
     if (domains.Find(domain.name)) {
-      place.Member("name").Fail(StrCat("a domain named \"", domain.name, "\" exists already"));
+      place.Member("name").Fail("a domain named " + QuotedName(domain.name) + " exists already");
     }
     domains.CreateAt(id, std::move(domain));
   }

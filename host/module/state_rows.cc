@@ -6,6 +6,7 @@
 #include "host/module/json_names.h"
 #include "host/module/permission_letters.h"
 #include "host/module/state_fields.h"
+#include "host/text/quoted_name.h"
 #include "platform/tavon_strcat.h"
 
 namespace StandIn {
@@ -25,7 +26,7 @@ RuleKind ReadRuleKind(const JsonCursor& place) {
       return static_cast<RuleKind>(i);
     }
   }
-  place.Fail(StrCat("no kind of rules has the keyword \"", keyword, "\""));
+  place.Fail("no kind of rules has the keyword " + QuotedName(keyword));
 }
 
 Decision ReadDecision(const JsonCursor& place) {

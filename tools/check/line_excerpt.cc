@@ -3,10 +3,11 @@
 #include <algorithm>
 #include <string_view>
 
-#include "tools/policy/terminal.h"
-#include "tools/policy/utf8_text.h"
+#include "host/text/utf8_text.h"
 
 namespace SecPolicyTool {
+
+using StandIn::CharacterCount;
 
 namespace {
 
@@ -32,12 +33,13 @@ LineExcerpt ExcerptOf(const std::string& line, unsigned int column, unsigned int
   const std::size_t end =
       isLong ? CharacterBegin(whole, std::min(begin + kShown, whole.size())) : whole.size();
   const std::size_t stop = std::clamp<std::size_t>(at + std::max(1U, length), at, end);
-  const std::string before = (begin > 0 ? kCut : "") + Printable(whole.substr(begin, at - begin));
-  const std::string meant = Printable(whole.substr(at, stop - at));
-  const std::string behind = Printable(whole.substr(stop, end - stop));
-  const std::size_t width = std::max<std::size_t>(1, CharacterCount(meant));
+  const TerminalText before =
+      (begin > 0 ? kCut : "") + TerminalText(whole.substr(begin, at - begin));
+  const TerminalText meant = whole.substr(at, stop - at);
+  const TerminalText behind = whole.substr(stop, end - stop);
+  const std::size_t width = std::max<std::size_t>(1, CharacterCount(meant.Text()));
   return {before + meant + behind + (end < whole.size() ? kCut : ""),
-          std::string(CharacterCount(before), ' ') + "^" + std::string(width - 1, '~')};
+          std::string(CharacterCount(before.Text()), ' ') + "^" + std::string(width - 1, '~')};
 }
 
 }  // namespace SecPolicyTool

@@ -3,12 +3,14 @@
 
 #include <string>
 
+#include "tools/policy/terminal.h"
+
 namespace SecPolicyTool {
 
-// Two lines of equal indentation for a terminal. Control characters and bytes that are no UTF-8 are
-// written as \xNN; of a long line, only what is near the mark is shown, between "...".
+// Two lines of equal indentation for a terminal; of a long line, only what is near the mark is
+// shown, between "...".
 struct LineExcerpt {
-  std::string text;
+  TerminalText text;
   std::string mark;  // blanks, then "^", then "~" below the rest of what is meant
 };
 

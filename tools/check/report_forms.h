@@ -17,8 +17,8 @@ struct FindingCounts {
 FindingCounts CountsOf(const CheckReport& report);
 
 // "FILE:LINE:COLUMN: error: MESSAGE [id]", the line, the mark below it and "help: ...", each on a
-// line of its own; "" for nothing. Safe for a terminal.
-std::string TextForm(const Finding& finding, const Painter& painter);
+// line of its own; "" for nothing.
+TerminalText TextForm(const Finding& finding, const Painter& painter);
 
 // "2 errors, 1 warning in 14 files".
 std::string SummaryForm(const CheckReport& report);

@@ -5,11 +5,14 @@
 #include <nlohmann/json.hpp>
 #include <string_view>
 
+#include "host/text/utf8_text.h"
 #include "tools/check/finding_kinds.h"
 #include "tools/check/report_forms.h"
-#include "tools/policy/utf8_text.h"
 
 namespace SecPolicyTool {
+
+using StandIn::CharacterCount;
+using StandIn::ValidText;
 
 using nlohmann::json;
 

@@ -11,16 +11,18 @@ std::string Counted(std::size_t count, const char* what) {
   return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
 }
 
-std::string PlaceInFront(const Place& place) {
-  return place.file.empty() ? std::string() : Printable(PlaceText(place)) + ": ";
+TerminalText PlaceInFront(const Place& place) {
+  return place.file.empty() ? "" : PlaceText(place) + ": ";
 }
 
-std::string MarkedLine(const Finding& finding, Colour colour, const Painter& painter) {
+TerminalText MarkedLine(const Finding& finding, Colour colour, const Painter& painter) {
   if (finding.place.line == 0) return {};
   const LineExcerpt excerpt = ExcerptOf(finding.source, finding.place.column, finding.length);
   const std::size_t indent = excerpt.mark.find('^');
-  return "  " + excerpt.text + "\n  " + excerpt.mark.substr(0, indent) +
-         painter.Paint(colour, excerpt.mark.substr(indent)) + "\n";
+  TerminalText text = ("  " + excerpt.text).EndLine();
+  text +=
+      "  " + excerpt.mark.substr(0, indent) + painter.Paint(colour, excerpt.mark.substr(indent));
+  return text.EndLine();
 }
 
 }  // namespace
@@ -32,15 +34,16 @@ FindingCounts CountsOf(const CheckReport& report) {
   return {errors, report.findings.size() - errors};
 }
 
-std::string TextForm(const Finding& finding, const Painter& painter) {
+TerminalText TextForm(const Finding& finding, const Painter& painter) {
   const bool isError = finding.severity == Severity::kError;
   const Colour colour = isError ? Colour::kRed : Colour::kYellow;
-  std::string text = painter.Paint(Colour::kBold, PlaceInFront(finding.place)) +
-                     painter.Paint(colour, isError ? "error:" : "warning:") + " " +
-                     Printable(finding.message) + " [" + finding.id + "]\n" +
-                     MarkedLine(finding, colour, painter);
+  TerminalText text = painter.Paint(Colour::kBold, PlaceInFront(finding.place)) +
+                      painter.Paint(colour, isError ? "error:" : "warning:") + " " +
+                      finding.message + " [" + finding.id + "]";
+  text.EndLine() += MarkedLine(finding, colour, painter);
   if (!finding.help.empty()) {
-    text += painter.Paint(Colour::kCyan, "help:") + " " + Printable(finding.help) + "\n";
+    text += painter.Paint(Colour::kCyan, "help:") + " " + finding.help;
+    text.EndLine();
   }
   return text;
 }

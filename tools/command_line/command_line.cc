@@ -4,7 +4,7 @@
 #include <nlohmann/json.hpp>
 #include <utility>
 
-#include "tools/policy/terminal.h"
+#include "host/text/escaped.h"
 
 namespace SecPolicyTool {
 
@@ -55,8 +55,9 @@ std::int64_t WholeNumber(const std::string& text, std::int64_t least, std::int64
   const char* const end = text.data() + text.size();
   const auto [stop, error] = std::from_chars(text.data(), end, number);
   if (error != std::errc() || stop != end || number < least || number > most) {
-    throw std::invalid_argument("\"" + Printable(text) + "\" is not a whole number from " +
-                                std::to_string(least) + " to " + std::to_string(most));
+    throw std::invalid_argument("\"" + StandIn::Escaped(text).Text() +
+                                "\" is not a whole number from " + std::to_string(least) + " to " +
+                                std::to_string(most));
   }
   return number;
 }

@@ -2,8 +2,8 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 
+#include "host/text/escaped.h"
 #include "tools/command_line/command_line.h"
-#include "tools/policy/terminal.h"
 
 namespace SecPolicyTool {
 
@@ -20,7 +20,8 @@ bool IsOperand(const CommandOption& option) { return !option.names.front().start
 void RequireChoice(const CommandOption& option, const std::string& value) {
   const auto& choices = option.choices;
   if (choices.empty() || std::find(choices.begin(), choices.end(), value) != choices.end()) return;
-  throw std::invalid_argument("\"" + Printable(value) + "\" is none of " + Joined(choices, ", "));
+  throw std::invalid_argument("\"" + StandIn::Escaped(value).Text() + "\" is none of " +
+                              Joined(choices, ", "));
 }
 
 void StoreValues(const CommandOption& option, const CLI::results_t& values) try {

@@ -1,3 +1,4 @@
+#include "host/text/escaped.h"
 #include "tools/graph/graph_forms.h"
 
 namespace SecPolicyTool {
@@ -19,7 +20,7 @@ std::string Quoted(const std::string& text) {
 // What a label shows as `text`: labels have escapes and entities of their own.
 std::string LabelText(const std::string& text) {
   std::string label;
-  for (const char c : Printable(text)) {
+  for (const char c : StandIn::Escaped(text).Text()) {
     if (c == '"' || c == '\\') label += '\\';
     label += c == '&' ? "&amp;" : std::string(1, c);
   }

@@ -11,7 +11,7 @@ namespace SecPolicyTool {
 
 // For a terminal: a line for each domain and, below it, one for each of its transitions, with the
 // place of the rule. Nothing in it can change what a terminal shows but the painter's colours.
-std::string GraphText(const TransitionGraph& graph, const Painter& painter);
+TerminalText GraphText(const TransitionGraph& graph, const Painter& painter);
 
 // In the language of Graphviz: a node for each domain, an edge for each link, labelled with its
 // transitions; of more than six, with the first six and how many there are besides. Names may hold

@@ -9,17 +9,17 @@ namespace {
 
 // "  --label,event--> target" and the place.
 struct Row {
-  std::string transition;
-  std::string place;
+  TerminalText transition;
+  TerminalText place;
 };
 
 std::vector<Row> RowsOf(const TransitionGraph& graph, std::size_t domain) {
   std::vector<Row> rows;
   for (const Link& link : graph.LinksFrom(domain)) {
     for (const Transition& transition : graph.TransitionsOf(link)) {
-      rows.push_back({Printable("--" + transition.label + "," + transition.event + "--> " +
-                                graph.Domains()[link.to]),
-                      Printable(PlaceText(transition.place))});
+      rows.push_back(
+          {"--" + transition.label + "," + transition.event + "--> " + graph.Domains()[link.to],
+           PlaceText(transition.place)});
     }
   }
   return rows;
@@ -27,22 +27,24 @@ std::vector<Row> RowsOf(const TransitionGraph& graph, std::size_t domain) {
 
 std::size_t WidthOf(const std::vector<Row>& rows) {
   std::size_t width = 0;
-  for (const Row& row : rows) width = std::max(width, row.transition.size());
+  for (const Row& row : rows) width = std::max(width, row.transition.Text().size());
   return width;
 }
 
 }  // namespace
 
-std::string GraphText(const TransitionGraph& graph, const Painter& painter) {
-  std::string text;
+TerminalText GraphText(const TransitionGraph& graph, const Painter& painter) {
+  TerminalText text;
   for (std::size_t domain = 0; domain < graph.Domains().size(); ++domain) {
     const std::vector<Row> rows = RowsOf(graph, domain);
-    text += painter.Paint(Colour::kBold, Printable(graph.Domains()[domain])) +
-            (rows.empty() ? " (no transitions)\n" : "\n");
+    text += painter.Paint(Colour::kBold, graph.Domains()[domain]);
+    if (rows.empty()) text += " (no transitions)";
+    text.EndLine();
     const std::size_t width = WidthOf(rows);
     for (const Row& row : rows) {
-      const std::string gap(width - row.transition.size() + 2, ' ');
-      text += "  " + row.transition + gap + painter.Paint(Colour::kCyan, row.place) + "\n";
+      const std::string gap(width - row.transition.Text().size() + 2, ' ');
+      text += "  " + row.transition + gap + painter.Paint(Colour::kCyan, row.place);
+      text.EndLine();
     }
   }
   return text;

@@ -11,7 +11,7 @@
 
 #include "host/image/file_io.h"
 #include "host/image/unique_fd.h"
-#include "tools/policy/terminal.h"
+#include "host/text/escaped.h"
 
 namespace SecPolicyTool {
 
@@ -90,7 +90,7 @@ int RunDot(const std::string& format, const Streams& streams) {
 
 std::string Complaint(std::string said, int status) {
   while (said.ends_with('\n')) said.pop_back();
-  if (!said.empty()) return Printable(said);
+  if (!said.empty()) return StandIn::Escaped(said).Text();
   return WIFSIGNALED(status) ? "signal " + std::to_string(WTERMSIG(status))
                              : "exit status " + std::to_string(WEXITSTATUS(status));
 }

@@ -22,8 +22,8 @@ std::string RuleLine(const TransitionGraph& graph, const Transition& transition)
   return LineOf(rule);
 }
 
-std::string Name(const TransitionGraph& graph, std::size_t domain) {
-  return Printable(graph.Domains()[domain]);
+TerminalText Name(const TransitionGraph& graph, std::size_t domain) {
+  return graph.Domains()[domain];
 }
 
 std::string Counted(std::size_t count, const char* what) {
@@ -31,28 +31,31 @@ std::string Counted(std::size_t count, const char* what) {
 }
 
 // A step's rules, a line for each, aligned among one another.
-std::string StepText(const TransitionGraph& graph, const Link& link, const Painter& painter) {
+TerminalText StepText(const TransitionGraph& graph, const Link& link, const Painter& painter) {
   std::size_t width = 0;
   for (const Transition& rule : graph.TransitionsOf(link)) {
-    width = std::max(width, Printable(RuleLine(graph, rule)).size());
+    width = std::max(width, TerminalText(RuleLine(graph, rule)).Text().size());
   }
-  std::string text = "   " + Name(graph, link.from) + " -> " + Name(graph, link.to) + "\n";
+  TerminalText text = "   " + Name(graph, link.from) + " -> " + Name(graph, link.to);
+  text.EndLine();
   for (const Transition& rule : graph.TransitionsOf(link)) {
-    const std::string line = Printable(RuleLine(graph, rule));
-    text += "     " + line + std::string(width - line.size() + 2, ' ') +
-            painter.Paint(Colour::kCyan, Printable(PlaceText(rule.place))) + "\n";
+    const TerminalText line = RuleLine(graph, rule);
+    text += "     " + line + std::string(width - line.Text().size() + 2, ' ') +
+            painter.Paint(Colour::kCyan, PlaceText(rule.place));
+    text.EndLine();
   }
   return text;
 }
 
-std::string PathText(const TransitionGraph& graph, const DomainPath& path, std::size_t number,
-                     const Painter& painter) {
-  std::string chain;
+TerminalText PathText(const TransitionGraph& graph, const DomainPath& path, std::size_t number,
+                      const Painter& painter) {
+  TerminalText chain;
   for (const std::size_t domain : path) {
-    chain += (chain.empty() ? "" : " -> ") + Name(graph, domain);
+    chain += (domain == path.front() ? "" : " -> ") + Name(graph, domain);
   }
-  std::string text = std::to_string(number) + ". " + painter.Paint(Colour::kBold, chain) + " (" +
-                     Counted(path.size() - 1, "step") + ")\n";
+  TerminalText text = std::to_string(number) + ". " + painter.Paint(Colour::kBold, chain) + " (" +
+                      Counted(path.size() - 1, "step") + ")";
+  text.EndLine();
   for (std::size_t step = 0; step + 1 < path.size(); ++step) {
     text += StepText(graph, LinkOf(graph, path, step), painter);
   }
@@ -76,17 +79,18 @@ std::size_t RequireDomain(const TransitionGraph& graph, const std::string& name)
   throw std::runtime_error(UnknownWordText("domain", name, graph.Domains()));
 }
 
-std::string PathsText(const TransitionGraph& graph, const PathQuestion& question,
-                      const FoundPaths& found, const Painter& painter) {
+TerminalText PathsText(const TransitionGraph& graph, const PathQuestion& question,
+                       const FoundPaths& found, const Painter& painter) {
   if (found.paths.empty()) {
-    return Name(graph, question.to) + " is not reached from " + Name(graph, question.from) +
-           (question.event ? " by " + Printable(*question.event) : "") + "\n";
+    return (Name(graph, question.to) + " is not reached from " + Name(graph, question.from) +
+            (question.event ? " by " + *question.event : ""))
+        .EndLine();
   }
-  std::string text;
+  TerminalText text;
   for (std::size_t i = 0; i < found.paths.size(); ++i) {
     text += PathText(graph, found.paths[i], i + 1, painter);
   }
-  if (found.hasMore) text += "There are more paths, which are not shorter.\n";
+  if (found.hasMore) (text += "There are more paths, which are not shorter.").EndLine();
   return text;
 }
 

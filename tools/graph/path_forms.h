@@ -23,8 +23,8 @@ std::size_t RequireDomain(const TransitionGraph& graph, const std::string& name)
 
 // For a terminal: each path with its steps, each step with the rules that allow it and their
 // places; or "TO is not reached from FROM".
-std::string PathsText(const TransitionGraph& graph, const PathQuestion& question,
-                      const FoundPaths& found, const Painter& painter);
+TerminalText PathsText(const TransitionGraph& graph, const PathQuestion& question,
+                       const FoundPaths& found, const Painter& painter);
 
 // As docs/schemas/paths.schema.json describes it.
 nlohmann::json PathsJson(const TransitionGraph& graph, const PathQuestion& question,

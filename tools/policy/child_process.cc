@@ -8,6 +8,7 @@
 #include <array>
 #include <cerrno>
 #include <exception>
+#include <iostream>
 #include <string_view>
 #include <system_error>
 
@@ -15,6 +16,7 @@
 #include "tools/policy/error_messages.h"
 #include "tools/policy/exit_status.h"
 #include "tools/policy/output.h"
+#include "tools/policy/terminal.h"
 
 namespace SecPolicyTool {
 
@@ -31,6 +33,7 @@ namespace {
   int status = kFailed;
   try {
     if (dup2(errors.Get(), STDERR_FILENO) < 0) ThrowSystemError("dup2");
+    StopEscaping(std::cerr);  // a pipe now, whatever it was
     errors.Reset();
     status = work();
     FlushOutput();

@@ -4,9 +4,11 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
+#include "tools/policy/terminal.h"
+
 namespace SecPolicyTool {
 
-void ReportError(const std::string& text) { std::cerr << "Error: " + text + "\n" << std::flush; }
+void ReportError(const std::string& text) { PrintLine(std::cerr, "Error: " + text); }
 
 std::string TextOfJson(const nlohmann::json& content) {
   return content.dump(2, ' ', false, nlohmann::json::error_handler_t::replace) + "\n";

@@ -6,7 +6,8 @@
 
 namespace SecPolicyTool {
 
-// "Error: " + text on standard error: the form in which the library reports, too.
+// "Error: " + text on standard error: the form in which the library reports, too. Escaped where
+// that is a terminal (see PrintLine), so that `text` may hold any bytes.
 void ReportError(const std::string& text);
 
 // `content` as lines of text, indented. Bytes that are not UTF-8, which JSON cannot hold, are

@@ -6,6 +6,8 @@
 #include <iostream>
 #include <utility>
 
+#include "tools/policy/terminal.h"
+
 namespace SecPolicyTool {
 
 using std::chrono::steady_clock;
@@ -46,12 +48,12 @@ void Progress::Tick() {
 
 void Progress::Clear() {
   if (!isDrawn_) return;
-  out_ << "\r\x1b[K" << std::flush;
+  out_ << TerminalText::EraseLine() << std::flush;
   isDrawn_ = false;
 }
 
 void Progress::Draw(steady_clock::duration elapsed) {
-  out_ << "\r\x1b[K" << what_;
+  out_ << TerminalText::EraseLine() << what_;
   if (total_ == 0) {
     out_ << " ... " << std::chrono::duration_cast<std::chrono::seconds>(elapsed).count() << " s";
   } else {

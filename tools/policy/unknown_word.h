@@ -7,7 +7,7 @@
 namespace SecPolicyTool {
 
 // `unknown WHAT "WORD" (nearest: NEAREST)`, or without the bracket when none of `known` is near:
-// the form in which the kernel refuses words, too. Printable.
+// the form in which the kernel refuses words, too. The words are escaped.
 std::string UnknownWordText(const std::string& what, const std::string& word,
                             const std::vector<std::string>& known);
 

@@ -1,6 +1,5 @@
 #include "tools/query/decision.h"
 
-#include "tools/policy/terminal.h"
 #include "tools/query/paths.h"
 
 namespace SecPolicyTool {
@@ -46,13 +45,13 @@ Answer Decide(const Policy& policy, const std::string& domain, const Question& q
   return DomainDecisions(policy.domains.at(domain)).Decide(question);
 }
 
-std::string RuleText(const PolicyRule& rule) {
+TerminalText RuleText(const PolicyRule& rule) {
   const std::string line = LineOf(rule);
-  return Printable(rule.place ? line + " (" + PlaceText(rule.place) + ")" : line);
+  return rule.place ? line + " (" + PlaceText(rule.place) + ")" : line;
 }
 
-std::string AnswerText(const Answer& answer) {
-  const std::string decision = answer.isAllowed ? "yes: " : "no: ";
+TerminalText AnswerText(const Answer& answer) {
+  const TerminalText decision = answer.isAllowed ? "yes: " : "no: ";
   return decision + (answer.rule == nullptr ? "no rule" : RuleText(*answer.rule));
 }
 

@@ -5,6 +5,7 @@
 #include <string>
 
 #include "tools/policy/policy.h"
+#include "tools/policy/terminal.h"
 #include "tools/query/question.h"
 
 namespace SecPolicyTool {
@@ -49,10 +50,10 @@ class Decisions {
 Answer Decide(const Policy& policy, const std::string& domain, const Question& question);
 
 // "yes: RULE (PLACE)", "no: RULE (PLACE)" or "no: no rule"; without the bracket when the place is
-// not known. Printable.
-std::string AnswerText(const Answer& answer);
+// not known.
+TerminalText AnswerText(const Answer& answer);
 
 // "RULE (PLACE)", as there.
-std::string RuleText(const PolicyRule& rule);
+TerminalText RuleText(const PolicyRule& rule);
 
 }  // namespace SecPolicyTool

@@ -15,7 +15,7 @@ class DifferencePrinter {
 
   void Heading(const std::string& text) {
     Separate();
-    out_ << painter_.Paint(Colour::kBold, Printable(text)) << "\n";
+    out_ << painter_.Paint(Colour::kBold, text).EndLine();
   }
 
   // A domain that is new or gone says so itself.
@@ -32,7 +32,7 @@ class DifferencePrinter {
   void Line(Change change, const std::string& text, const std::optional<Place>& place) {
     const Mark& mark = MarkOf(change);
     const std::string at = place ? "  (" + PlaceText(place) + ")" : "";
-    out_ << painter_.Paint(mark.colour, mark.sign + Printable(text)) << Printable(at) << "\n";
+    out_ << (painter_.Paint(mark.colour, mark.sign + text) + at).EndLine();
   }
 
  private:

@@ -1,7 +1,5 @@
 #include "tools/query/outcomes.h"
 
-#include "tools/policy/terminal.h"
-
 namespace SecPolicyTool {
 
 std::vector<Outcome> Judge(const Policy& policy, const std::vector<Statement>& statements) {
@@ -22,14 +20,14 @@ std::vector<Outcome> Judge(const Policy& policy, const std::vector<Statement>& s
   return outcomes;
 }
 
-std::string OutcomeText(const Statement& statement, const Outcome& outcome) {
+TerminalText OutcomeText(const Statement& statement, const Outcome& outcome) {
   if (statement.target.empty()) return AnswerText(outcome.answer);
   if (!outcome.way) return "no way";
   if (outcome.way->empty()) return "the same domain";
-  std::string text;
+  TerminalText text;
   for (const Step& step : *outcome.way) {
-    text += (text.empty() ? "" : ", ") +
-            Printable(*step.from + " -> " + step.rule->key.words[1] + ": ") + RuleText(*step.rule);
+    text += (text == "" ? "" : ", ") + *step.from + " -> " + step.rule->key.words[1] + ": " +
+            RuleText(*step.rule);
   }
   return text;
 }

@@ -23,6 +23,6 @@ std::vector<Outcome> Judge(const Policy& policy, const std::vector<Statement>& s
 
 // What the policy says: AnswerText, or "no way", "the same domain", or
 // "FROM -> TO: RULE (PLACE)" for each step, with commas between them.
-std::string OutcomeText(const Statement& statement, const Outcome& outcome);
+TerminalText OutcomeText(const Statement& statement, const Outcome& outcome);
 
 }  // namespace SecPolicyTool

@@ -6,12 +6,13 @@
 
 #include "host/module/nearest_word.h"
 #include "host/module/word_lists.h"
-#include "tools/policy/terminal.h"
+#include "host/text/escaped.h"
 #include "tools/policy/unknown_word.h"
 #include "tools/query/paths.h"
 
 namespace SecPolicyTool {
 
+using StandIn::Escaped;
 using Words = std::vector<std::string>;
 
 namespace {
@@ -63,7 +64,7 @@ std::uint32_t PathPermission(const std::string& word) {
   for (const PathOperation& each : kPathOperations) {
     if (word == each.word) return each.permission;
   }
-  RefuseForm("there is no operation " + Printable(word) +
+  RefuseForm("there is no operation " + Escaped(word).Text() +
              " on a path; there are read, write and exec");
 }
 
@@ -87,7 +88,7 @@ bool Holds(const Words& list, const std::string& word) {
 std::string NearestText(const std::string& word, Words known) {
   for (const Operation& each : Operations()) known.emplace_back(each.word);
   const auto nearest = StandIn::NearestWord(word, known);
-  return nearest && *nearest != word ? " (nearest: " + Printable(*nearest) + ")" : "";
+  return nearest && *nearest != word ? " (nearest: " + Escaped(*nearest).Text() + ")" : "";
 }
 
 // What is wrong with the word for that place of a rule; nothing when it will do.
@@ -100,8 +101,9 @@ std::optional<std::string> ProblemOf(const std::string& word, std::size_t positi
   }
   const Words& list = vocabulary.lists.at(*info.list);
   if (Holds(list, word)) return std::nullopt;
-  return position == 0 ? "unknown operation \"" + Printable(word) + "\"" + NearestText(word, list)
-                       : StandIn::UnknownWordText(*info.list, word, list);
+  return position == 0
+             ? "unknown operation \"" + Escaped(word).Text() + "\"" + NearestText(word, list)
+             : StandIn::UnknownWordText(*info.list, word, list);
 }
 
 }  // namespace
@@ -113,8 +115,8 @@ void CheckForm(const Words& words) {
   }
   const bool isNamed = OperationOf(words).word != nullptr;
   if (!isNamed && words.size() != 2) {
-    RefuseForm(Printable(words[0]) + " is no operation with " + std::to_string(words.size() - 1) +
-               " words" + NearestText(words[0], {}));
+    RefuseForm(Escaped(words[0]).Text() + " is no operation with " +
+               std::to_string(words.size() - 1) + " words" + NearestText(words[0], {}));
   }
 }
 

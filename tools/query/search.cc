@@ -4,7 +4,6 @@
 #include <array>
 #include <map>
 
-#include "tools/policy/terminal.h"
 #include "tools/query/paths.h"
 
 namespace SecPolicyTool {
@@ -64,11 +63,11 @@ std::vector<FoundRule> Search(const Policy& policy, const SearchTerms& terms) {
   return found;
 }
 
-std::string FoundText(const FoundRule& found) {
+TerminalText FoundText(const FoundRule& found) {
   const std::optional<Place>& place = found.rule->place;
   const bool hasFile = place && !place->file.empty();
   const std::string where = hasFile ? PlaceText(Place{place->file, place->line, 0}) : *found.domain;
-  return Printable(where + ": " + LineOf(*found.rule));
+  return where + ": " + LineOf(*found.rule);
 }
 
 std::optional<RuleType> TypeNamed(const std::string& name) {

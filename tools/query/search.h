@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "tools/policy/policy.h"
+#include "tools/policy/terminal.h"
 
 namespace SecPolicyTool {
 
@@ -32,8 +33,8 @@ struct FoundRule {
 // The rules for which all terms hold: by domain, and in its order.
 std::vector<FoundRule> Search(const Policy& policy, const SearchTerms& terms);
 
-// "FILE:LINE: RULE", or "DOMAIN: RULE" when its file is not known. Printable.
-std::string FoundText(const FoundRule& found);
+// "FILE:LINE: RULE", or "DOMAIN: RULE" when its file is not known.
+TerminalText FoundText(const FoundRule& found);
 
 // The type that a person means: by its keyword, with or without the "-"; by its name; or by the
 // word that is used for it in questions. Nothing for anything else.

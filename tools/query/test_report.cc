@@ -12,8 +12,8 @@ using nlohmann::json;
 
 namespace {
 
-std::string PlaceOf(const TestRun& run, const Statement& statement) {
-  return Printable(run.file) + ":" + std::to_string(statement.line);
+TerminalText PlaceOf(const TestRun& run, const Statement& statement) {
+  return run.file + ":" + std::to_string(statement.line);
 }
 
 json WayJson(const std::vector<Step>& way) {
@@ -36,8 +36,7 @@ void PrintText(const TestRun& run, const Painter& painter, std::ostream& out) {
     const Statement& statement = run.statements[i];
     if (run.outcomes[i].holds) continue;
     out << PlaceOf(run, statement) << ": " << painter.Paint(Colour::kRed, "expected") << " \""
-        << Printable(statement.text) << "\", but " << OutcomeText(statement, run.outcomes[i])
-        << "\n";
+        << (statement.text + "\", but " + OutcomeText(statement, run.outcomes[i])).EndLine();
   }
   const std::string summary = std::to_string(run.statements.size()) + " statements, " +
                               std::to_string(run.Failed()) + " failed";
@@ -49,10 +48,10 @@ void PrintTap(const TestRun& run, std::ostream& out) {
   for (std::size_t i = 0; i < run.statements.size(); ++i) {
     const Statement& statement = run.statements[i];
     out << (run.outcomes[i].holds ? "ok " : "not ok ") << i + 1 << " - "
-        << Printable(statement.text) << "\n";
+        << TerminalText(statement.text).EndLine();
     if (run.outcomes[i].holds) continue;
-    out << "# " << PlaceOf(run, statement) << ": " << OutcomeText(statement, run.outcomes[i])
-        << "\n";
+    out << ("# " + PlaceOf(run, statement) + ": " + OutcomeText(statement, run.outcomes[i]))
+               .EndLine();
   }
 }
 

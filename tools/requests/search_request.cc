@@ -5,7 +5,7 @@
 #include <memory>
 #include <nlohmann/json.hpp>
 
-#include "tools/policy/terminal.h"
+#include "host/text/escaped.h"
 #include "tools/query/bad_request.h"
 #include "tools/query/paths.h"
 #include "tools/query/rule_json.h"
@@ -14,6 +14,7 @@
 namespace SecPolicyTool {
 
 using nlohmann::json;
+using StandIn::Escaped;
 
 namespace {
 
@@ -31,8 +32,8 @@ std::shared_ptr<const RE2> RegexOf(const std::string& text) {
   options.set_max_mem(kPatternMemory);
   auto regex = std::make_shared<const RE2>(text, options);
   if (!regex->ok()) {
-    throw BadRequest("\"" + Printable(text) +
-                     "\" is no regular expression: " + Printable(regex->error()));
+    throw BadRequest("\"" + Escaped(text).Text() +
+                     "\" is no regular expression: " + Escaped(regex->error()).Text());
   }
   return regex;
 }
@@ -54,11 +55,11 @@ void Require(const std::string& problem) {
 }  // namespace
 
 std::string TypeProblem(const std::string& name) {
-  return TypeNamed(name) ? "" : "no type of rules is called \"" + Printable(name) + "\"";
+  return TypeNamed(name) ? "" : "no type of rules is called \"" + Escaped(name).Text() + "\"";
 }
 
 std::string PathProblem(const std::string& path) {
-  return path.starts_with('/') ? "" : "not an absolute path: \"" + Printable(path) + "\"";
+  return path.starts_with('/') ? "" : "not an absolute path: \"" + Escaped(path).Text() + "\"";
 }
 
 SearchTerms TermsOf(const SearchRequest& request, const HostPaths& paths) {

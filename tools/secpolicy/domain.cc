@@ -33,7 +33,7 @@ void List(const DomainArguments& arguments) {
     if (arguments.isJson) {
       rows.push_back(ToJson(row));
     } else {
-      std::cout << row.id << " " << Printable(row.name) << "\n";
+      std::cout << row.id << " " << TerminalText(row.name).EndLine();
     }
   }
   if (arguments.isJson) PrintJson({{"domains", rows}});
@@ -44,7 +44,7 @@ void Print(const DomainArguments& arguments, unsigned int id, const std::string&
   if (arguments.isJson) {
     PrintJson({{"id", id}, {"name", name}});
   } else {
-    std::cout << id << " " << Printable(name) << "\n";
+    std::cout << id << " " << TerminalText(name).EndLine();
   }
 }
 

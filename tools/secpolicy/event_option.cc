@@ -7,7 +7,7 @@
 #include "host/module/description_json.h"
 #include "host/module/module_description.h"
 #include "host/module/word_lists.h"
-#include "tools/policy/terminal.h"
+#include "host/text/escaped.h"
 #include "tools/secpolicy/host_option.h"
 
 namespace SecPolicyTool {
@@ -28,8 +28,8 @@ void RequireEvent(const std::string& host, const std::optional<std::string>& eve
       directory.DescriptionText(), directory.Ref().PathOf(StandIn::kDescriptionFile));
   const std::vector<std::string>& events = description.words.at(WordList::kTransitionEvents);
   if (std::find(events.begin(), events.end(), *event) != events.end()) return;
-  throw std::runtime_error(
-      Printable(StandIn::UnknownWordText(WordList::kTransitionEvents, *event, events)));
+  const std::string problem = StandIn::UnknownWordText(WordList::kTransitionEvents, *event, events);
+  throw std::runtime_error(StandIn::Escaped(problem).Text());
 }
 
 }  // namespace SecPolicyTool

@@ -44,7 +44,7 @@ void List(const FilesArguments& arguments) {
     if (arguments.isJson) {
       rows.push_back({{"path", rule.path}, {"permission", letters == "-" ? "" : letters}});
     } else {
-      std::cout << letters << " " << Printable(rule.path) << "\n";
+      std::cout << letters << " " << TerminalText(rule.path).EndLine();
     }
   }
   if (arguments.isJson) PrintJson({{"files", rows}});

@@ -38,17 +38,23 @@ std::string Formatted(const GraphArguments& arguments, const TransitionGraph& gr
   if (arguments.isJson || arguments.format == "json") return JsonText(arguments, graph);
   if (arguments.format == "dot") return GraphDot(graph);
   if (arguments.format == "svg") return RunGraphviz(GraphDot(graph), "svg");
-  return GraphText(graph, Painter(arguments.file.empty() && WantsColour(STDOUT_FILENO)));
+  return GraphText(graph, Painter(false)).Text();
+}
+
+bool IsText(const GraphArguments& arguments) {
+  return !arguments.isJson && arguments.format == "text";
 }
 
 ExitStatus PrintGraph(const GraphArguments& arguments) {
   RequireEvent(arguments.host, arguments.event);
   const Policy policy = ReadPolicy(arguments.host, arguments.source, OnErrors::kWarn);
-  const std::string text = Formatted(arguments, TransitionGraph(policy, arguments.event));
-  if (arguments.file.empty()) {
-    std::cout << text;
+  const TransitionGraph graph(policy, arguments.event);
+  if (!arguments.file.empty()) {
+    WriteOutputFile(arguments.file, Formatted(arguments, graph));
+  } else if (IsText(arguments)) {
+    std::cout << GraphText(graph, Painter(WantsColour(STDOUT_FILENO)));
   } else {
-    WriteOutputFile(arguments.file, text);
+    std::cout << Formatted(arguments, graph);
   }
   return kDone;
 }

@@ -4,6 +4,7 @@
 
 #include "host/image/assemble.h"
 #include "host/image/host_directory.h"
+#include "tools/policy/terminal.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
 
@@ -21,7 +22,7 @@ ExitStatus AssembleHost(const AssembleArguments& arguments) {
   host.SetChanges(arguments.changes);
   const StandIn::AssembleReport report = StandIn::Assemble(host);
   for (const auto& tardisk : report.tardisks) {
-    std::cout << tardisk.name << ": " << tardisk.entries << " entries\n";
+    PrintLine(std::cout, tardisk.name + ": " + std::to_string(tardisk.entries) + " entries");
   }
   std::cout << report.tardisks.size() << " tardisks, " << report.entries << " entries\n";
   return kDone;

@@ -8,6 +8,7 @@
 #include "host/image/state_keeper.h"
 #include "host/module/description_json.h"
 #include "host/module/simulated_module.h"
+#include "tools/policy/terminal.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
 
@@ -26,7 +27,8 @@ void PrintImage(const HostDirectory& host) {
   const ImageIndex index = ParseImageIndex(*text, host.Ref().PathOf(kIndexFile));
   std::cout << "Image: " << index.tardisks.size() << " tardisks\n";
   for (const TardiskContent& tardisk : index.tardisks) {
-    std::cout << "  " << tardisk.name << ": " << tardisk.paths.size() << " paths\n";
+    PrintLine(std::cout,
+              "  " + tardisk.name + ": " + std::to_string(tardisk.paths.size()) + " paths");
   }
 }
 
@@ -34,18 +36,18 @@ void PrintImage(const HostDirectory& host) {
 void PrintDomain(SimulatedModule& module, DomainId domain) {
   const auto info = module.GetDomainInfo(domain);
   if (!info) return;
-  std::cout << "  " << domain << " " << info->name << ":";
+  std::string line = "  " + std::to_string(domain) + " " + info->name + ":";
   std::size_t rules = 0;
-  const auto print = [&](const std::string& keyword, std::size_t count) {
-    if (count != 0) std::cout << " " << keyword << " " << count;
+  const auto add = [&](const std::string& keyword, std::size_t count) {
+    if (count != 0) line += " " + keyword + " " + std::to_string(count);
     rules += count;
   };
   for (std::size_t kind = 0; kind < kRuleKinds; ++kind) {
     const auto ruleKind = static_cast<RuleKind>(kind);
-    print(InfoOf(ruleKind).keyword, module.Rules(ruleKind, domain).size());
+    add(InfoOf(ruleKind).keyword, module.Rules(ruleKind, domain).size());
   }
-  print("-r", module.CountFileRules(domain));
-  std::cout << (rules == 0 ? " no rules\n" : "\n");
+  add("-r", module.CountFileRules(domain));
+  PrintLine(std::cout, rules == 0 ? line + " no rules" : line);
 }
 
 void PrintKernel(const HostDirectory& host, const ModuleDescription& description) {
@@ -61,9 +63,10 @@ void PrintKernel(const HostDirectory& host, const ModuleDescription& description
 void PrintInfo(const HostDirectory& host) {
   const ModuleDescription description =
       ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile));
-  std::cout << "Host: " << host.Path() << "\nLimits: " << description.limits.domains << " domains, "
-            << description.limits.labels << " labels of each type, "
-            << description.limits.fileRulesPerDomain << " file rules a domain\n";
+  PrintLine(std::cout, "Host: " + host.Path());
+  std::cout << "Limits: " << description.limits.domains << " domains, " << description.limits.labels
+            << " labels of each type, " << description.limits.fileRulesPerDomain
+            << " file rules a domain\n";
   PrintImage(host);
   PrintKernel(host, description);
 }

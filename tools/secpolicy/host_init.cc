@@ -4,6 +4,7 @@
 
 #include "host/image/host_directory.h"
 #include "host/module/description_json.h"
+#include "tools/policy/terminal.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
 
@@ -13,8 +14,8 @@ namespace {
 
 ExitStatus MakeHost(const std::string& dir) {
   StandIn::HostDirectory::Create(dir, StandIn::DefaultDescriptionText());
-  std::cerr << "Made the host directory " + dir + ". Put its tardisks into " + dir +
-                   "/tardisks, then run: secpolicy host assemble " + dir + "\n";
+  PrintLine(std::cerr, "Made the host directory " + dir + ". Put its tardisks into " + dir +
+                           "/tardisks, then run: secpolicy host assemble " + dir);
   return kDone;
 }
 

@@ -80,7 +80,7 @@ void Get(const LabelArguments& arguments, Results& results) {
     if (arguments.isJson) {
       results.rows.push_back({{"path", path}, {"label", label}});
     } else {
-      std::cout << Printable(label) << " " << Printable(path) << "\n";
+      std::cout << (TerminalText(label) + " " + path).EndLine();
     }
   });
   if (arguments.isJson) PrintJson({{"files", results.rows}});
@@ -92,8 +92,7 @@ void ShowChanges(const LabelArguments& arguments, Results& results) {
   iface.LookupLabel(arguments.label, ZekCtl::Security::kObjectLabel);
   ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
     if (label == arguments.label) return;
-    std::cout << Printable(path) << ": " << Printable(label) << " -> " << Printable(arguments.label)
-              << "\n";
+    std::cout << (TerminalText(path) + ": " + label + " -> " + arguments.label).EndLine();
   });
 }
 
@@ -128,8 +127,9 @@ void Verify(const LabelArguments& arguments, const PolicyFiles& files, Results& 
                               {"expected", line->label},
                               {"place", ToJson(line->place)}});
     } else {
-      std::cout << Printable(path) << ": " << Printable(label) << ", not " << Printable(line->label)
-                << " (" << Printable(PlaceText(line->place)) << ")\n";
+      std::cout << (TerminalText(path) + ": " + label + ", not " + line->label + " (" +
+                    PlaceText(line->place) + ")")
+                       .EndLine();
     }
   });
   if (arguments.isJson) PrintJson({{"differences", results.rows}});

@@ -17,6 +17,7 @@
 #include "tools/policy/progress.h"
 #include "tools/policy/progress_filter.h"
 #include "tools/query/host_paths.h"
+#include "tools/policy/terminal.h"
 #include "tools/requests/batch_load.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/source_option.h"
@@ -92,7 +93,7 @@ ExitStatus Load(const LoadArguments& arguments) {
   const auto show = [&, isReasonShown = false](std::string& line) mutable {
     if (!FilterProgress(line)) return;
     progress.Clear();
-    std::cerr << line + "\n";
+    PrintLine(std::cerr, line);
     if (isReasonShown) return;
     const std::string reason = DescriptorLimitReason(
         line, [&](const std::string& dir) { return paths.OpensDirectory(dir); });

@@ -3,6 +3,7 @@
 
 #include "tools/policy/error_messages.h"
 #include "tools/policy/output.h"
+#include "tools/policy/terminal.h"
 #include "tools/secpolicy/verbs.h"
 
 namespace SecPolicyTool {
@@ -37,9 +38,12 @@ ExitStatus Run(int argc, char** argv) {
 
 }  // namespace SecPolicyTool
 
-int main(int argc, char** argv) try {
-  return SecPolicyTool::Run(argc, argv);
-} catch (const std::exception& failure) {
-  SecPolicyTool::ReportError(SecPolicyTool::MessageOf(failure));
-  return SecPolicyTool::kFailed;
+int main(int argc, char** argv) {
+  const SecPolicyTool::TerminalOutput output;
+  try {
+    return SecPolicyTool::Run(argc, argv);
+  } catch (const std::exception& failure) {
+    SecPolicyTool::ReportError(SecPolicyTool::MessageOf(failure));
+    return SecPolicyTool::kFailed;
+  }
 }

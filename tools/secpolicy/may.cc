@@ -31,7 +31,7 @@ ExitStatus PrintAnswer(const MayArguments& arguments) {
   } else {
     const Painter painter(WantsColour(STDOUT_FILENO));
     std::cout << painter.Paint(answer.isAllowed ? Colour::kGreen : Colour::kRed, AnswerText(answer))
-              << "\n";
+                     .EndLine();
   }
   return answer.isAllowed ? kDone : kFailed;
 }

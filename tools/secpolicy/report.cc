@@ -8,6 +8,7 @@
 #include "tools/check/check.h"
 #include "tools/policy/output.h"
 #include "tools/policy/output_file.h"
+#include "tools/policy/terminal.h"
 #include "tools/query/digest.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/source_option.h"
@@ -25,7 +26,7 @@ struct ReportArguments {
 };
 
 void Warn(const std::string& text) {
-  std::cerr << "Warning: " + text + "; the transitions are drawn without it\n";
+  PrintLine(std::cerr, "Warning: " + text + "; the transitions are drawn without it");
 }
 
 Report MakeReport(const ReportArguments& arguments) {

@@ -47,7 +47,7 @@ ExitStatus PrintFound(const SearchArguments& arguments) {
   if (arguments.isJson) {
     PrintJson(SearchJson(arguments.source, found));
   } else {
-    for (const FoundRule& each : found) std::cout << FoundText(each) << "\n";
+    for (const FoundRule& each : found) std::cout << FoundText(each).EndLine();
   }
   return found.empty() ? kFailed : kDone;
 }

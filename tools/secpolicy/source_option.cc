@@ -4,6 +4,7 @@
 #include <stdexcept>
 
 #include "tools/policy/output.h"
+#include "tools/policy/terminal.h"
 #include "tools/secpolicy/host_option.h"
 
 namespace SecPolicyTool {
@@ -38,11 +39,12 @@ Policy ReadPolicy(const std::string& host, const std::string& source, OnErrors o
   if (read.errors.empty()) return std::move(read.policy);
   const std::string& first = read.errors.front();
   if (onErrors == OnErrors::kWarn) {
-    std::cerr << "Warning: a load of " + source + " reports errors, the first of them: " + first +
-                     "\nWarning: what follows is what such a load installs; for all findings, "
-                     "\"secpolicy "
-                     "check " +
-                     source + "\"\n";
+    PrintLine(std::cerr,
+              "Warning: a load of " + source + " reports errors, the first of them: " + first);
+    PrintLine(std::cerr,
+              "Warning: what follows is what such a load installs; for all findings, \"secpolicy "
+              "check " +
+                  source + "\"");
     return std::move(read.policy);
   }
   for (const std::string& error : read.errors) ReportError(error);

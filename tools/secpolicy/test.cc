@@ -10,6 +10,7 @@
 
 #include "host/image/file_io.h"
 #include "host/image/system_failure.h"
+#include "host/text/escaped.h"
 #include "tools/policy/output.h"
 #include "tools/query/test_report.h"
 #include "tools/secpolicy/asking.h"
@@ -37,7 +38,7 @@ std::vector<Statement> StatementsIn(const PolicyText& text, const AskedPolicy& a
   StatementFile file = ParseStatements(
       text, asked.vocabulary, [&](const std::string& name) { return asked.paths.Resolve(name); });
   for (const StatementProblem& problem : file.problems) {
-    ReportError(Printable(path) + ":" + std::to_string(problem.line) + ":" +
+    ReportError(StandIn::Escaped(path).Text() + ":" + std::to_string(problem.line) + ":" +
                 std::to_string(problem.column) + ": " + problem.text);
   }
   if (!file.problems.empty()) throw std::runtime_error(path + " has mistakes; nothing was tested");

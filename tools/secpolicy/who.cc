@@ -25,7 +25,7 @@ ExitStatus PrintAllowed(const WhoArguments& arguments) {
     PrintJson(WhoJson({arguments.asking.policy, arguments.words}, question, allowed));
   } else {
     for (const AllowedDomain& each : allowed) {
-      std::cout << Printable(each.name) << ": " << RuleText(*each.rule) << "\n";
+      std::cout << (TerminalText(each.name) + ": " + RuleText(*each.rule)).EndLine();
     }
   }
   return allowed.empty() ? kFailed : kDone;

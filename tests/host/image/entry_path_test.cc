@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include "host/image/quoted_name.h"
 #include "tests/host/image/temporary_directory.h"
 
 namespace StandIn {
@@ -79,18 +78,6 @@ TEST(EntryPathTest, OnlyMadePathsAreBelowTheRoot) {
 TEST(EntryPathTest, ParentIsThePathWithoutItsLastComponent) {
   EXPECT_EQ(ParentOf("/a"), "/");
   EXPECT_EQ(ParentOf("/a/b/c"), "/a/b");
-}
-
-TEST(QuotedNameTest, ShowsWhatATerminalWouldObey) {
-  EXPECT_EQ(QuotedName("etc/motd"), "\"etc/motd\"");
-  EXPECT_EQ(QuotedName("\x1b[2J\n\x7f"), "\"\\x1b[2J\\x0a\\x7f\"");
-  EXPECT_EQ(QuotedName("a\"b\\c"), "\"a\\x22b\\x5cc\"");
-  EXPECT_EQ(QuotedName("\xc3\xa4"), "\"\xc3\xa4\"");
-}
-
-TEST(QuotedNameTest, CutsLongNames) {
-  EXPECT_EQ(QuotedName(std::string(255, 'a')), "\"" + std::string(255, 'a') + "\"");
-  EXPECT_EQ(QuotedName(std::string(256, 'a')), "\"" + std::string(255, 'a') + "...\"");
 }
 
 }  // namespace

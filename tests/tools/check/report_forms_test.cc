@@ -3,12 +3,16 @@
 
 #include <nlohmann/json.hpp>
 
+#include "host/text/utf8_text.h"
 #include "tests/tools/check/check_fixture.h"
 #include "tests/tools/schema.h"
 #include "tools/check/line_excerpt.h"
-#include "tools/policy/utf8_text.h"
 
 namespace SecPolicyTool {
+
+using StandIn::CharacterBytes;
+using StandIn::CharacterCount;
+using StandIn::ValidText;
 namespace {
 
 using nlohmann::json;
@@ -56,7 +60,7 @@ TEST(LineExcerpt, LongLineIsCutBetweenCharacters) {
   std::string line;
   for (int i = 0; i < 200; ++i) line += "\xE2\x82\xAC";
   const LineExcerpt excerpt = ExcerptOf(line, 301, 3);
-  EXPECT_THAT(excerpt.text, testing::Not(HasSubstr("\\x")));
+  EXPECT_THAT(excerpt.text.Text(), testing::Not(HasSubstr("\\x")));
   EXPECT_EQ(excerpt.mark, std::string(23, ' ') + "^");
 }
 

@@ -197,7 +197,7 @@ Policy PolicyOfNames(const std::string& domain, const std::string& label) {
 
 TEST(GraphFormsTest, NamesCannotChangeATerminal) {
   const std::string text =
-      GraphText(TransitionGraph(PolicyOfNames("a\x1b[2Jb", "l\nx")), Painter(false));
+      GraphText(TransitionGraph(PolicyOfNames("a\x1b[2Jb", "l\nx")), Painter(false)).Text();
   EXPECT_EQ(text, "a\\x1b[2Jb\n  --l\\x0ax,exec--> a\\x1b[2Jb  -\n");
 }
 

@@ -6,6 +6,8 @@
 #include <unistd.h>
 
 #include <cstdlib>
+#include <iostream>
+#include <sstream>
 
 namespace SecPolicyTool {
 namespace {
@@ -59,10 +61,96 @@ TEST(PainterTest, PaintsOrLeavesAsItIs) {
   EXPECT_EQ(Painter(false).Paint(Colour::kRed, "x"), "x");
 }
 
-TEST(PrintableTest, ControlCharactersAreShown) {
-  EXPECT_EQ(Printable("a\tb\x1b[0m\x7f\n"), "a\\x09b\\x1b[0m\\x7f\\x0a");
-  EXPECT_EQ(Printable("\xC2\x9b\xFF"), "\\xc2\\x9b\\xff");
-  EXPECT_EQ(Printable("gr\xC3\xBC\xC3\x9F"), "gr\xC3\xBC\xC3\x9F");
+TEST(TerminalTextTest, EveryStringIsEscapedOnTheWay) {
+  const TerminalText text =
+      Painter(true).Paint(Colour::kRed, "a\x1b[2J") + "\n" + std::string("b\r");
+  EXPECT_EQ(text, "\x1b[31ma\\x1b[2J\x1b[0m\\x0ab\\x0d");
+  EXPECT_EQ(TerminalText("a").EndLine(), "a\n");
+}
+
+// What a stream hands on that is, or is not, a terminal.
+class OutputTest : public testing::Test {
+ protected:
+  void SetUp() override { before_ = std::cout.rdbuf(sent_.rdbuf()); }
+  void TearDown() override { std::cout.rdbuf(before_); }
+  std::string Sent() {
+    std::string sent = sent_.str();
+    sent_.str("");
+    return sent;
+  }
+
+ private:
+  std::ostringstream sent_;
+  std::streambuf* before_ = nullptr;
+};
+
+TEST_F(OutputTest, TerminalIsSentEscapedBytesAndLineEnds) {
+  const TerminalOutput output(true, false);
+  std::cout << "a\x1b[2J\tb\n\xC3\xBC\xE2\x80\xAE" << std::flush;
+  EXPECT_EQ(Sent(), "a\\x1b[2J\\x09b\n\xC3\xBC\\xe2\\x80\\xae");
+}
+
+TEST_F(OutputTest, PipeIsSentTheBytes) {
+  const TerminalOutput output(false, false);
+  std::cout << "a\x1b[2J\tb\n\xC3\xBC\xE2\x80\xAE" << std::flush;
+  EXPECT_EQ(Sent(), "a\x1b[2J\tb\n\xC3\xBC\xE2\x80\xAE");
+  PrintLine(std::cout, "a\nb");
+  EXPECT_EQ(Sent(), "a\nb\n");
+}
+
+TEST_F(OutputTest, TextThatIsEscapedByTypeKeepsItsColours) {
+  const TerminalOutput output(true, false);
+  std::cout << "<" << Painter(true).Paint(Colour::kRed, "a\x1b") << ">"
+            << TerminalText::EraseLine();
+  EXPECT_EQ(Sent(), "<\x1b[31ma\\x1b\x1b[0m>\r\x1b[K");
+}
+
+TEST_F(OutputTest, CharacterMayComeInPieces) {
+  const TerminalOutput output(true, false);
+  std::cout << '\xE2' << '\x82' << '\xAC' << std::flush;
+  EXPECT_EQ(Sent(), "\xE2\x82\xAC");
+  std::cout << '\xC2' << '\x9B' << std::flush;
+  EXPECT_EQ(Sent(), "\\xc2\\x9b");
+  std::cout << "\xE2" << std::flush;
+  EXPECT_EQ(Sent(), "\\xe2");
+  std::cout << "\xE2" << TerminalText("x") << "\xC3"
+            << "A" << std::flush;
+  EXPECT_EQ(Sent(), "\\xe2x\\xc3A");
+}
+
+TEST_F(OutputTest, LineOnATerminalIsOneLine) {
+  const TerminalOutput output(true, false);
+  PrintLine(std::cout, "Error: a\nError: b");
+  EXPECT_EQ(Sent(), "Error: a\\x0aError: b\n");
+}
+
+TEST_F(OutputTest, EscapingEndsWithTheTerminal) {
+  TerminalOutput output(true, false);
+  StopEscaping(std::cout);
+  std::cout << "\x1b";
+  EXPECT_EQ(Sent(), "\x1b");
+}
+
+TEST_F(OutputTest, StreamIsGivenBack) {
+  { const TerminalOutput output(true, true); }
+  std::cout << "\x1b";
+  EXPECT_EQ(Sent(), "\x1b");
+}
+
+TEST_F(OutputTest, FullDiskIsSeen) {
+  class Full : public std::streambuf {};
+  Full full;
+  std::streambuf* before = std::cout.rdbuf(&full);
+  {
+    const TerminalOutput output(true, false);
+    std::cout << TerminalText("x");
+    EXPECT_TRUE(std::cout.bad());
+    std::cout.clear();
+    std::cout << "x";
+    EXPECT_TRUE(std::cout.bad());
+  }
+  std::cout.rdbuf(before);
+  std::cout.clear();
 }
 
 }  // namespace

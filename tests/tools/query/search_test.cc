@@ -158,7 +158,7 @@ TEST(SearchOfWorldsTest, EveryWorldHasItsOwnDecidingRule) {
   SearchTerms terms;
   terms.path = "/etc/a/b";
   std::vector<std::string> found;
-  for (const FoundRule& each : Search(policy, terms)) found.push_back(FoundText(each));
+  for (const FoundRule& each : Search(policy, terms)) found.push_back(FoundText(each).Text());
   EXPECT_THAT(found, ElementsAre("policy:1: -r /etc r", "policy:3: -r /etc/a rw # world 7"));
 }
 

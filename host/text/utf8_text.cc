@@ -1,16 +1,16 @@
-#include "tools/policy/utf8_text.h"
+#include "host/text/utf8_text.h"
 
 #include <algorithm>
 
-namespace SecPolicyTool {
+namespace StandIn {
 
 namespace {
 
 // What the first byte says, and the smallest code point that needs so many bytes.
 struct Lead {
   std::size_t bytes;
-  unsigned int bits;
-  unsigned int smallest;
+  char32_t bits;
+  char32_t smallest;
 };
 
 Lead LeadOf(unsigned char byte) {
@@ -23,18 +23,21 @@ Lead LeadOf(unsigned char byte) {
 
 }  // namespace
 
-std::size_t CharacterBytes(std::string_view text) {
+Character FirstCharacter(std::string_view text) {
   const Lead lead = LeadOf(static_cast<unsigned char>(text.front()));
-  if (lead.bytes == 0 || lead.bytes > text.size()) return 0;
-  unsigned int point = lead.bits;
+  if (lead.bytes == 0 || lead.bytes > text.size()) return {};
+  char32_t point = lead.bits;
   for (std::size_t i = 1; i < lead.bytes; ++i) {
     const auto byte = static_cast<unsigned char>(text[i]);
-    if (byte >> 6 != 0x2) return 0;
+    if (byte >> 6 != 0x2) return {};
     point = point << 6 | (byte & 0x3FU);
   }
   const bool isSurrogate = point >= 0xD800 && point <= 0xDFFF;
-  return point < lead.smallest || point > 0x10FFFF || isSurrogate ? 0 : lead.bytes;
+  if (point < lead.smallest || point > 0x10FFFF || isSurrogate) return {};
+  return {lead.bytes, point};
 }
+
+std::size_t CharacterBytes(std::string_view text) { return FirstCharacter(text).bytes; }
 
 std::size_t CharacterCount(std::string_view text) {
   std::size_t count = 0;
@@ -54,4 +57,4 @@ std::string ValidText(std::string_view text) {
   return valid;
 }
 
-}  // namespace SecPolicyTool
+}  // namespace StandIn
