@@ -47,6 +47,15 @@ std::size_t CharacterCount(std::string_view text) {
   return count;
 }
 
+std::string Shortened(const std::string& text, std::size_t most) {
+  std::size_t end = 0;
+  for (std::size_t characters = 0; end < text.size(); ++characters) {
+    if (characters == most) return text.substr(0, end) + "…";
+    end += std::max<std::size_t>(1, CharacterBytes(std::string_view(text).substr(end)));
+  }
+  return text;
+}
+
 std::string ValidText(std::string_view text) {
   std::string valid;
   while (!text.empty()) {

@@ -23,6 +23,9 @@ std::size_t CharacterBytes(std::string_view text);
 // The number of characters, each byte that belongs to none counting as one.
 std::size_t CharacterCount(std::string_view text);
 
+// The first characters of valid UTF-8 and "…" when it has more than `most`, else `text`.
+std::string Shortened(const std::string& text, std::size_t most);
+
 // `text` with U+FFFD in place of each byte that belongs to no character.
 std::string ValidText(std::string_view text);
 

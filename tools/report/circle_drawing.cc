@@ -3,8 +3,8 @@
 #include <map>
 #include <numbers>
 
+#include "host/text/utf8_text.h"
 #include "tools/report/drawing.h"
-#include "tools/report/visible_text.h"
 
 namespace SecPolicyTool {
 
@@ -40,7 +40,7 @@ double RoomForNames(const TransitionGraph& graph, const std::vector<std::size_t>
   constexpr double kCharacterWidth = 7.6;
   std::size_t longest = 0;
   for (const std::size_t domain : domains) {
-    longest = std::max(longest, CharactersIn(DrawnName(graph, domain)));
+    longest = std::max(longest, StandIn::CharacterCount(DrawnName(graph, domain)));
   }
   return static_cast<double>(longest) * kCharacterWidth + 32;
 }

@@ -3,7 +3,8 @@
 #include <array>
 #include <charconv>
 
-#include "tools/report/visible_text.h"
+#include "host/text/escaped.h"
+#include "host/text/utf8_text.h"
 
 namespace SecPolicyTool {
 
@@ -14,13 +15,14 @@ constexpr std::size_t kLongestName = 26;
 }  // namespace
 
 std::string DrawnName(const TransitionGraph& graph, std::size_t domain) {
-  return Shortened(VisibleText(graph.Domains()[domain]), kLongestName);
+  return StandIn::Shortened(StandIn::Escaped(graph.Domains()[domain]).Text(), kLongestName);
 }
 
 std::string CaptionOf(const TransitionGraph& graph, const Link& link) {
   const Transition& first = graph.TransitionsOf(link).front();
   const std::string caption =
-      Shortened(VisibleText(first.label), kLongestName) + ", " + VisibleText(first.event);
+      StandIn::Shortened(StandIn::Escaped(first.label).Text(), kLongestName) + ", " +
+      StandIn::Escaped(first.event).Text();
   return link.count == 1 ? caption : caption + " +" + std::to_string(link.count - 1);
 }
 

@@ -1,9 +1,9 @@
 #include <sstream>
 #include <stdexcept>
 
+#include "host/text/utf8_text.h"
 #include "tools/graph/graphviz.h"
 #include "tools/report/drawing.h"
-#include "tools/report/visible_text.h"
 
 namespace SecPolicyTool {
 
@@ -23,12 +23,12 @@ constexpr double kNameWidth = 7.6;
 constexpr double kCaptionWidth = 6.2;
 
 double BoxWidth(const TransitionGraph& graph, std::size_t domain) {
-  return static_cast<double>(CharactersIn(DrawnName(graph, domain))) * kNameWidth + 28;
+  return static_cast<double>(StandIn::CharacterCount(DrawnName(graph, domain))) * kNameWidth + 28;
 }
 
 // A table of one cell is a caption of a size that no font has a say in.
 std::string CaptionBox(const TransitionGraph& graph, const Link& link) {
-  const auto characters = static_cast<double>(CharactersIn(CaptionOf(graph, link)));
+  const auto characters = static_cast<double>(StandIn::CharacterCount(CaptionOf(graph, link)));
   return R"(<<table border="0" fixedsize="true" height="16" width=")" +
          std::to_string(static_cast<int>(characters * kCaptionWidth + 10)) +
          R"("><tr><td></td></tr></table>>)";

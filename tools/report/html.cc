@@ -2,7 +2,7 @@
 
 #include <utility>
 
-#include "tools/report/visible_text.h"
+#include "host/text/escaped.h"
 
 namespace SecPolicyTool {
 
@@ -10,7 +10,7 @@ namespace {
 
 std::string Escaped(const std::string& text) {
   std::string escaped;
-  for (const char c : VisibleText(text)) {
+  for (const char c : StandIn::Escaped(text).Text()) {
     switch (c) {
       case '&':
         escaped += "&amp;";

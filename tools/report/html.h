@@ -16,7 +16,7 @@ struct Attribute {
 class Html {
  public:
   Html() = default;
-  Html(const std::string& text);  // what a page cannot show is written as by VisibleText
+  Html(const std::string& text);  // what a page cannot show is written as by StandIn::Escaped
   Html(const char* text) : Html(std::string(text)) {}
 
   // Markup, which is taken as it is: the one way around escaping. Never for what a policy says.

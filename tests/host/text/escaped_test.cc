@@ -38,6 +38,7 @@ TEST(EscapedTest, WhatSetsTheDirectionOrIsNotSeenIsWrittenOut) {
       "\xC2\xAD",     "\xE1\xA0\x8E",      // U+00AD, U+180E
       "\xE2\x80\xA8", "\xE2\x80\xA9",      // U+2028, U+2029: separators
       "\xEF\xB8\x8F", "\xF3\xA0\x80\x81",  // U+FE0F, U+E0001
+      "\xEF\xBF\xBE", "\xEF\xBF\xBF",      // U+FFFE, U+FFFF
       "\xE3\x85\xA4", "\xF3\xA0\xBF\xBF",  // U+3164, U+E0FFF
   };
   for (const std::string& character : unseen) {
@@ -54,6 +55,35 @@ TEST(EscapedTest, BytesThatAreNotUtf8AreWrittenOut) {
   EXPECT_EQ(Shown("\xED\xA0\x80"), "\\xed\\xa0\\x80");           // a surrogate
   EXPECT_EQ(Shown("\xF4\x90\x80\x80"), "\\xf4\\x90\\x80\\x80");  // beyond the last
   EXPECT_EQ(Shown("\x9B"), "\\x9b");
+}
+
+TEST(EscapedTest, Table) {
+  struct Case {
+    std::string text;
+    std::string visible;
+  };
+  for (const Case& row : {
+           Case{"", ""},
+           Case{"plain /etc/hosts", "plain /etc/hosts"},
+           Case{std::string("a\0b", 3), R"(a\x00b)"},
+           Case{"a\tb\r\n\x1b[2J\x7f", R"(a\x09b\x0d\x0a\x1b[2J\x7f)"},
+           Case{"grün, 域, 🙂", "grün, 域, 🙂"},
+           // What has no shape, or turns the direction of writing.
+           Case{std::string("a\xe2\x80") + "\xae.", R"(a\xe2\x80\xae.)"},
+           Case{"a\u200bb\ufeff", R"(a\xe2\x80\x8bb\xef\xbb\xbf)"},
+           Case{"a\u0085", R"(a\xc2\x85)"},
+           // What is no UTF-8: lone bytes, cut short, overlong, surrogates, beyond the last.
+           Case{"a\xff\x80z", R"(a\xff\x80z)"},
+           Case{"\xe5\x9f", R"(\xe5\x9f)"},
+           Case{"\xe5\x9fz", R"(\xe5\x9fz)"},
+           Case{"\xc0\xbc", R"(\xc0\xbc)"},
+           Case{"\xe0\x80\xbc", R"(\xe0\x80\xbc)"},
+           Case{"\xed\xa0\x80", R"(\xed\xa0\x80)"},
+           Case{"\xf4\x90\x80\x80", R"(\xf4\x90\x80\x80)"},
+           Case{"\xf8\x88\x80\x80\x80", R"(\xf8\x88\x80\x80\x80)"},
+       }) {
+    EXPECT_EQ(Shown(row.text), row.visible);
+  }
 }
 
 TEST(QuotedNameTest, ShowsWhatATerminalWouldObey) {

@@ -3,16 +3,12 @@
 
 #include <nlohmann/json.hpp>
 
-#include "host/text/utf8_text.h"
 #include "tests/tools/check/check_fixture.h"
 #include "tests/tools/schema.h"
 #include "tools/check/line_excerpt.h"
 
 namespace SecPolicyTool {
 
-using StandIn::CharacterBytes;
-using StandIn::CharacterCount;
-using StandIn::ValidText;
 namespace {
 
 using nlohmann::json;
@@ -62,29 +58,6 @@ TEST(LineExcerpt, LongLineIsCutBetweenCharacters) {
   const LineExcerpt excerpt = ExcerptOf(line, 301, 3);
   EXPECT_THAT(excerpt.text.Text(), testing::Not(HasSubstr("\\x")));
   EXPECT_EQ(excerpt.mark, std::string(23, ' ') + "^");
-}
-
-TEST(Utf8Text, BytesThatMakeNoCharacterAreTold) {
-  const std::pair<std::string, std::size_t> kCases[] = {
-      {"a", 1},
-      {"\xC3\xA4", 2},
-      {"\xE2\x82\xAC", 3},
-      {"\xF0\x9F\x98\x80", 4},
-      {"\x80", 0},
-      {"\xC3", 0},
-      {"\xC3(", 0},
-      {"\xC0\xAF", 0},
-      {"\xE0\x80\xAF", 0},
-      {"\xED\xA0\x80", 0},
-      {"\xF4\x90\x80\x80", 0},
-      {"\xFF", 0},
-  };
-  for (const auto& [text, bytes] : kCases) EXPECT_EQ(CharacterBytes(text), bytes) << text;
-  EXPECT_EQ(CharacterCount("a\xC3\xA4\xFF\xE2\x82"), 5U);
-  EXPECT_EQ(ValidText("a\xFF"
-                      "b\xC3\xA4"),
-            "a\xEF\xBF\xBD"
-            "b\xC3\xA4");
 }
 
 class ReportFormsTest : public CheckTest {
