@@ -1,4 +1,8 @@
+#include <algorithm>
+#include <string_view>
+
 #include "host/text/escaped.h"
+#include "host/text/utf8_text.h"
 #include "tools/graph/graph_forms.h"
 
 namespace SecPolicyTool {
@@ -7,12 +11,34 @@ namespace {
 
 constexpr std::size_t kMostLabels = 6;
 
-// A quoted identifier. Only a quotation mark ends it, and a backslash before one does not.
-std::string Quoted(const std::string& text) {
-  std::string quoted = "\"";
+// Bytes of a quoted identifier. Only a quotation mark ends it, and a backslash before one does not;
+// an entity has the character's meaning in a drawing's titles.
+void AppendQuoted(std::string& quoted, std::string_view text) {
   for (const char c : text) {
     if (c == '"' || c == '\\') quoted += '\\';
-    quoted += c;
+    quoted += c == '&' ? "&amp;" : std::string(1, c);
+  }
+}
+
+// An identifier that stands for `text` alone: a backslash of the text is doubled, one of an escape
+// is not.
+std::string Quoted(std::string_view text) {
+  std::string quoted = "\"";
+  // At the beginning, it marks names that Graphviz gives itself.
+  if (text.starts_with('%')) {
+    StandIn::AppendEscaped(quoted, text.front());
+    text.remove_prefix(1);
+  }
+  while (!text.empty()) {
+    const std::size_t bytes = std::max<std::size_t>(1, StandIn::CharacterBytes(text));
+    const std::string_view character = text.substr(0, bytes);
+    const std::string escaped = StandIn::Escaped(character).Text();
+    if (escaped == character) {
+      AppendQuoted(quoted, character);
+    } else {
+      quoted += escaped;
+    }
+    text.remove_prefix(bytes);
   }
   return quoted + '"';
 }

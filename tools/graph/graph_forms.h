@@ -15,7 +15,8 @@ TerminalText GraphText(const TransitionGraph& graph, const Painter& painter);
 
 // In the language of Graphviz: a node for each domain, an edge for each link, labelled with its
 // transitions; of more than six, with the first six and how many there are besides. Names may hold
-// any bytes.
+// any bytes: they are escaped (see StandIn::Escaped), each domain keeps an identifier of its own,
+// and what Graphviz draws is well-formed XML.
 std::string GraphDot(const TransitionGraph& graph);
 
 // As docs/schemas/graph.schema.json describes it, without its source.

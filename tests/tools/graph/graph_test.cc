@@ -1,7 +1,9 @@
 // secpolicy graph.
 #include <filesystem>
 #include <nlohmann/json.hpp>
+#include <regex>
 
+#include "host/text/escaped.h"
 #include "tests/tools/command_fixture.h"
 #include "tests/tools/schema.h"
 #include "tests/tools/stand_in_dot.h"
@@ -219,8 +221,11 @@ TEST(GraphFormsTest, NamesAreQuotedForGraphviz) {
            Case{R"(a\N)", R"("a\\N")"},
            Case{R"(a\)", R"("a\\")"},
            Case{R"(a\"];x)", R"("a\\\"];x")"},
-           Case{"a&lt;", R"("a&lt;" [label="a&amp;lt;"])"},
-           Case{"a\nb", "\"a\nb\" [label=\"a\\\\x0ab\"]"},
+           Case{"a&lt;", R"("a&amp;lt;")"},
+           Case{"%a%", R"("\x25a%" [label="%a%"])"},
+           Case{"a\nb", R"("a\x0ab" [label="a\\x0ab"])"},
+           Case{"a\\x0ab", R"("a\\x0ab")"},  // another domain than the one before
+           Case{"\x1b\xC2\x9B\xFF", R"("\x1b\xc2\x9b\xff" [label="\\x1b\\xc2\\x9b\\xff"])"},
        }) {
     SCOPED_TRACE(row.name);
     EXPECT_THAT(GraphDot(TransitionGraph(PolicyOfNames(row.name, "l"))),
@@ -239,6 +244,68 @@ TEST(GraphFormsTest, GraphvizReadsHostileNamesAsTheyAre) {
   }
   EXPECT_THAT(svg, HasSubstr(">a\\&quot;];evil[label=&quot;&lt;script&gt;</text>"));
   EXPECT_THAT(svg, HasSubstr(">x\\N&amp;lt;, exec</text>"));
+}
+
+// An XML parser accepts the drawing, and finds the names that it shows.
+TEST(GraphFormsTest, DrawingIsWellFormedWhateverTheNames) {
+  const std::vector<std::string> names{"&foo;",
+                                       "&#0;",
+                                       "&#x1b;",
+                                       "&amp;",
+                                       "a\x1b[2Jb",
+                                       "a\nb",
+                                       "\xFF\xFE",
+                                       "\xC2\x9B",
+                                       "]]>",
+                                       "--",
+                                       "<!--",
+                                       "</svg>",
+                                       "\"'\\",
+                                       "\x01\x7F",
+                                       "\xEF\xBF\xBF",
+                                       "\\",
+                                       "%s",
+                                       "a\tb",
+                                       "\\x1b",
+                                       "\x1b",
+                                       "\xE2\x80\xAE",
+                                       "\xED\xA0\x80",
+                                       "gr\xC3\xBC\xC3\x9F"};
+  SecPolicyTool::Policy policy;
+  for (const std::string& name : names) {
+    PolicyRule rule;
+    rule.key = {RuleType::kTransition, {name, names.front(), name}, 0};
+    rule.isGranted = true;
+    policy.domains[name].rules.push_back(rule);
+  }
+  std::string svg;
+  try {
+    svg = RunGraphviz(GraphDot(TransitionGraph(policy)), "svg");
+  } catch (const GraphvizMissing&) {
+    GTEST_SKIP() << "Graphviz is not installed";
+  }
+  const StandIn::TemporaryDirectory directory;
+  StandIn::WriteBytes(directory / "graph.svg", svg);
+  const Result parsed =
+      RunProgram("/usr/bin/python3",
+                 {"-c",
+                  "import sys, xml.etree.ElementTree as tree\n"
+                  "svg = tree.parse(sys.argv[1]).getroot()\n"
+                  "nodes = svg.findall('.//{*}g[@class=\"node\"]')\n"
+                  "print(len(nodes), *(node.find('{*}text').text for node in nodes), sep='\\n')\n",
+                  directory / "graph.svg"},
+                 [] { setenv("PYTHONIOENCODING", "utf-8", 1); });
+  EXPECT_EQ(parsed.err, "");
+  EXPECT_THAT(parsed.out, StartsWith(std::to_string(names.size()) + "\n"));
+  for (const std::string& name : names) {
+    EXPECT_THAT(parsed.out, HasSubstr("\n" + StandIn::Escaped(name).Text() + "\n"));
+  }
+}
+
+TEST(GraphFormsTest, DotHoldsNoControls) {
+  const std::string dot = GraphDot(
+      TransitionGraph(PolicyOfNames("a\x1b]0;t\x07\xC2\x9B\xE2\x80\xAE\xFF", "l\x1b[2J\r")));
+  EXPECT_EQ(StandIn::Escaped(dot).Text(), std::regex_replace(dot, std::regex("\n"), "\\x0a"));
 }
 
 TEST(GraphFormsTest, LinkOfManyTransitionsIsLabelledWithSome) {
