@@ -194,7 +194,7 @@ AssembleReport Assemble(const HostDirectory& host, const UnpackLimits& limits) {
   RemoveIndex(host.Ref());
   root.PutIntoPlace();
   state.Remove();
-  ReplaceFile(host.Ref(), kIndexFile, indexText, Writers::kOne);
+  ReplaceFile(host.Ref(), kIndexFile, indexText, Writers::kOne, Readers::kEverybody);
   return report;
 }
 

@@ -44,6 +44,8 @@ class TemporaryFile {
     return exists_ ? 0 : errno;
   }
 
+  int LetEverybodyRead() { return ::fchmod(fd_.Get(), 0644) == 0 ? 0 : errno; }
+
   int Fill(std::string_view text) {
     while (!text.empty()) {
       const ssize_t written = ::write(fd_.Get(), text.data(), text.size());
@@ -143,7 +145,7 @@ namespace {
 // False when the name has to be free and is not.
 enum class Existing { kReplaced, kStays };
 bool PutFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
-             Writers writers, Existing existing) {
+             Writers writers, Readers readers, Existing existing) {
   const auto check = [&](int number) {
     if (number != 0) {
       throw SystemFailure(dir.PathOf(name), "written", number);
@@ -154,6 +156,7 @@ bool PutFile(const DirectoryRef& dir, const std::string& name, const std::string
   check(directory.IsOpen() ? 0 : errno);
   TemporaryFile file(directory.Get(), NameInTheMaking(name, writers));
   check(file.Make());
+  if (readers == Readers::kEverybody) check(file.LetEverybodyRead());
   check(file.Fill(text));
   const bool isReplaced = existing == Existing::kReplaced;
   const int taken = isReplaced ? file.TakeName(name) : file.TakeFreeName(name);
@@ -168,12 +171,12 @@ bool PutFile(const DirectoryRef& dir, const std::string& name, const std::string
 }  // namespace
 
 bool MakeFileIfMissing(const DirectoryRef& dir, const std::string& name, const std::string& text) {
-  return PutFile(dir, name, text, Writers::kSeveral, Existing::kStays);
+  return PutFile(dir, name, text, Writers::kSeveral, Readers::kByMask, Existing::kStays);
 }
 
 void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
-                 Writers writers) {
-  PutFile(dir, name, text, writers, Existing::kReplaced);
+                 Writers writers, Readers readers) {
+  PutFile(dir, name, text, writers, readers, Existing::kReplaced);
 }
 
 }  // namespace StandIn

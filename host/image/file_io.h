@@ -37,6 +37,12 @@ enum class Writers {
   kOne,      // nobody: a lock sees to that
 };
 
+// Who may read the new file.
+enum class Readers {
+  kByMask,     // whom the process's mask leaves
+  kEverybody,  // everybody, whatever the mask: mode 0644
+};
+
 // Makes the file `name` in `dir`, whole and synced as below; false when something has that name
 // already, which stays. Throws HostError as below.
 bool MakeFileIfMissing(const DirectoryRef& dir, const std::string& name, const std::string& text);
@@ -51,6 +57,6 @@ bool MakeFileIfMissing(const DirectoryRef& dir, const std::string& name, const s
 // nothing of the new one remains (except when the last step, syncing the directory, failed: the new
 // content has the name then, but may not survive a power failure).
 void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
-                 Writers writers = Writers::kSeveral);
+                 Writers writers = Writers::kSeveral, Readers readers = Readers::kByMask);
 
 }  // namespace StandIn

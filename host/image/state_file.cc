@@ -173,7 +173,7 @@ std::optional<std::string> StateFile::Read() {
 }
 
 void StateFile::Write(const std::string& text) {
-  ReplaceFile(dir_, kStateFile, text, Writers::kOne);
+  ReplaceFile(dir_, kStateFile, text, Writers::kOne, Readers::kEverybody);
   Pin(UniqueFd(::openat(dir_.fd, kStateFile, O_PATH | O_CLOEXEC)));
 }
 

@@ -88,6 +88,7 @@ TEST_F(AssembleTest, TheProcessesMaskDoesntMatter) {
   EXPECT_EQ(Mode("/d"), 0777U);
   EXPECT_EQ(Mode("/d/f"), 0666U);
   EXPECT_EQ(Mode("/p"), 0666U);
+  EXPECT_EQ(Mode("/../image.json"), 0644U);
 }
 
 TEST_F(AssembleTest, SetIdBitsAreDroppedAndDirectoriesStayOpenToTheirOwner) {

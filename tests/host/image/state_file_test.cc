@@ -4,6 +4,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <signal.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 
 #include <chrono>
@@ -49,6 +50,18 @@ TEST_F(StateFileTest, NothingIsThereBeforeTheFirstWrite) {
   state_.Write("text");
   EXPECT_EQ(state_.Read(), "text");
   EXPECT_EQ(ReadBytes(Path("kernel.json")), "text");
+}
+
+// A host that root loaded can be read by whoever may read its directory.
+TEST_F(StateFileTest, IsReadableWhateverTheMask) {
+  for (const mode_t mask : {0000, 0022, 0077, 0777}) {
+    const mode_t before = ::umask(mask);
+    state_.Write("text");
+    ::umask(before);
+    struct stat status {};
+    ASSERT_EQ(::stat(Path("kernel.json").c_str(), &status), 0);
+    EXPECT_EQ(status.st_mode & 07777, 0644U) << std::oct << mask;
+  }
 }
 
 TEST_F(StateFileTest, RemovingTwiceIsFine) {
