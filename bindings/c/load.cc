@@ -64,7 +64,10 @@ HostWork LoadInHost(HostDirectory host, const PolicyPath& policy) {
   LoadEnd end = LoadEnd::kFailed;
   return SecPolicyTool::WorkInHost(
       std::move(host), options,
-      [&](Session& session) { end = SecPolicyTool::LoadInBatch(session, policy.path); },
+      [&](Session& session) {
+        SecPolicyTool::RequireDirectory(policy);
+        end = SecPolicyTool::LoadInBatch(session, policy.path);
+      },
       [&](Session& session) -> json {
         session.Commit();
         return {{"isDone", end == LoadEnd::kDone},

@@ -149,9 +149,10 @@ void secpolicy_host_free(secpolicy_host* host);
  *   SECPOLICY_LOAD_FAILED      what could be installed is; the error names the first logged error
  *                              that has a place
  *   SECPOLICY_LOAD_TERMINATED  what was installed before the domains were looked up is
- * With any other status it is NULL; the kernel holds what it held before, unless the message says
- * that the work was killed: then it may be either, see secpolicy_show. The load's progress goes to
- * the system log as "secpolicy". `result` may be NULL when it is not wanted. */
+ * SECPOLICY_FAILED when there is no such directory, among other things. With any other status it is
+ * NULL; the kernel holds what it held before, unless the message says that the work was killed:
+ * then it may be either, see secpolicy_show. The load's progress goes to the system log as
+ * "secpolicy". `result` may be NULL when it is not wanted. */
 secpolicy_status secpolicy_load(const secpolicy_host* host, const char* directory,
                                 secpolicy_text** result, secpolicy_error** error);
 

@@ -1,6 +1,7 @@
 #include "tools/policy/policy_path.h"
 
 #include <filesystem>
+#include <stdexcept>
 
 namespace SecPolicyTool {
 
@@ -27,6 +28,12 @@ PolicyPath LocatePolicy(const std::string& dir) {
   while (location.shown.size() > 1 && location.shown.ends_with('/')) location.shown.pop_back();
   if (fs::is_directory(location.path)) location.visible.push_back(location.path);
   return location;
+}
+
+void RequireDirectory(const PolicyPath& policy) {
+  if (!fs::is_directory(policy.path)) {
+    throw std::runtime_error("there is no policy directory " + policy.path);
+  }
 }
 
 }  // namespace SecPolicyTool

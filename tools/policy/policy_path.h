@@ -21,4 +21,8 @@ struct PolicyPath {
 // host's own, kSystemPolicyDir.
 PolicyPath LocatePolicy(const std::string& dir);
 
+// Throws std::runtime_error "there is no policy directory DIR". To be called in the host, in which
+// the directory may be.
+void RequireDirectory(const PolicyPath& policy);
+
 }  // namespace SecPolicyTool

@@ -2,9 +2,6 @@
 
 #include <syslog.h>
 
-#include <filesystem>
-#include <stdexcept>
-
 #include "secpolicy/secpolicy.h"
 #include "tools/policy/output.h"
 
@@ -18,9 +15,7 @@ StandIn::SessionOptions TrialOptions(const PolicyPath& dir) {
 }
 
 void LoadOnTrial(const PolicyPath& dir) {
-  if (!std::filesystem::is_directory(dir.path)) {
-    throw std::runtime_error("there is no policy directory " + dir.path);
-  }
+  RequireDirectory(dir);
   // The library logs nothing that is as urgent.
   setlogmask(LOG_MASK(LOG_EMERG));
   try {

@@ -3,6 +3,7 @@
 import gc
 import os
 import pathlib
+import shutil
 import unittest
 
 import secpolicy
@@ -67,10 +68,21 @@ class LoadTest(HostTest):
         self.assertIsNone(caught.exception.line)
         self.assertEqual(len(caught.exception.result.installed.domain("appDom").rules), 3)
 
+    def test_a_directory_that_is_not_there(self):
+        before = self.host.show()
+        with self.assertRaisesRegex(secpolicy.HostError, "^there is no policy directory /none$"):
+            self.host.load("/none")
+        self.assertEqual(self.host.show(), before)
+
     def test_without_a_directory_the_hosts_own_is_loaded(self):
-        with self.assertRaises(secpolicy.LoadTerminatedError) as caught:
+        with self.assertRaisesRegex(secpolicy.HostError,
+                                    "^there is no policy directory /etc/olvane/secpolicy$"):
             self.host.load()
-        self.assertEqual(caught.exception.result.source, "")
+        own = pathlib.Path(self.host.path) / "root/etc/olvane/secpolicy"
+        shutil.copytree(self.policy, own)
+        result = self.host.load()
+        self.assertEqual(result.source, "")
+        self.assertEqual(len(result.installed.domain("appDom").rules), 3)
 
 
 class CheckTest(HostTest):
