@@ -14,6 +14,7 @@
 #include "host/gate/private_call_answers.h"
 #include "host/gate/trap_filter.h"
 #include "host/gate/trapped_call.h"
+#include "host/trace/thread_occupation.h"
 #include "secpolicy/host/host_error.h"
 
 namespace StandIn {
@@ -60,18 +61,40 @@ long AnswerOrdinary(const AttachedHost* host, long number, const CallArguments& 
   }
 }
 
+void Answer(const AttachedHost* host, TrappedCall& call) {
+  if (IsPrivate(call.Number())) return AnswerPrivate(host, call);
+  call.SetResult(AnswerOrdinary(host, call.Number(), ArgumentsOf(call)));
+}
+
+// A call from a signal handler that interrupted an operation of its own thread. The operation holds
+// the lock, and the allocator may have been interrupted: so nothing is done but to refuse.
+void AnswerInterrupting(const AttachedHost* host, TrappedCall& call) {
+  const CallArguments arguments = ArgumentsOf(call);
+  if (IsPrivate(call.Number())) {
+    const PrivateAnswer answer = Refusal(EDEADLK);
+    call.SetResult(answer.status);
+    call.SetSecondResult(answer.error);
+  } else if (host == nullptr || !ConcernsModule(call.Number(), arguments)) {
+    call.SetResult(SecpolicyGatePassThrough(call.Number(), arguments.data()));
+  } else {
+    call.SetResult(-EDEADLK);
+  }
+}
+
 // Runs in the thread that made the call, at the call: what it interrupts is the caller's own code
 // at a point of its choosing, never the allocator or this process's libraries half-way, so it may
-// do what an ordinary function may.
+// do what an ordinary function may. A caller that is itself a signal handler answers for what it
+// has interrupted, except for an operation, which is noticed.
 void OnTrap(int, siginfo_t*, void* context) {
   const int savedErrno = errno;
   trappedCalls = trappedCalls + 1;
   TrappedCall call(*static_cast<ucontext_t*>(context));
   const AttachedHost* host = Attached();
-  if (IsPrivate(call.Number())) {
-    AnswerPrivate(host, call);
+  if (IsThreadOccupied()) {
+    AnswerInterrupting(host, call);
   } else {
-    call.SetResult(AnswerOrdinary(host, call.Number(), ArgumentsOf(call)));
+    const AnswerScope scope;
+    Answer(host, call);
   }
   errno = savedErrno;
 }

@@ -5,6 +5,7 @@
 #include <sys/xattr.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
@@ -97,6 +98,13 @@ void CheckFlags(std::uint64_t flags, bool carriesLabel) {
 }
 
 }  // namespace
+
+bool ConcernsModule(long number, const CallArguments& arguments) noexcept {
+  if (number == SYS_prctl) return true;
+  std::array<char, std::size(ZekCtl::Kernel::kLabelAttribute)> name{};
+  return TryReadMemory(arguments[1], name.data(), name.size()) &&
+         std::memcmp(name.data(), ZekCtl::Kernel::kLabelAttribute, name.size()) == 0;
+}
 
 long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments) noexcept {
   return AsResult([&]() -> long {

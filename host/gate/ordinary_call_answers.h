@@ -5,6 +5,10 @@
 
 namespace StandIn {
 
+// Whether the call is one that the module answers: any but those for other attributes. Safe in
+// signal handlers.
+bool ConcernsModule(long number, const CallArguments& arguments) noexcept;
+
 // Each answers as a system call does: a result, or a negative errno. Addresses may be anything.
 // None throws.
 

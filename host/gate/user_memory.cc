@@ -20,18 +20,24 @@ std::size_t BytesToPageEnd(std::uint64_t address) { return kPage - address % kPa
 using Copy = ssize_t (*)(pid_t, const iovec*, unsigned long, const iovec*, unsigned long,
                          unsigned long);
 
-void CopyMemory(Copy copy, std::uint64_t address, void* here, std::size_t size) {
-  if (size == 0) return;
+bool CopiesMemory(Copy copy, std::uint64_t address, void* here, std::size_t size) noexcept {
   const iovec local{here, size};
   const iovec remote{reinterpret_cast<void*>(address), size};
-  const ssize_t copied = copy(getpid(), &local, 1, &remote, 1, 0);
-  if (copied != static_cast<ssize_t>(size)) throw BadArgument{EFAULT};
+  return copy(getpid(), &local, 1, &remote, 1, 0) == static_cast<ssize_t>(size);
+}
+
+void CopyMemory(Copy copy, std::uint64_t address, void* here, std::size_t size) {
+  if (size != 0 && !CopiesMemory(copy, address, here, size)) throw BadArgument{EFAULT};
 }
 
 }  // namespace
 
 void ReadMemory(std::uint64_t address, void* to, std::size_t size) {
   CopyMemory(process_vm_readv, address, to, size);
+}
+
+bool TryReadMemory(std::uint64_t address, void* to, std::size_t size) noexcept {
+  return CopiesMemory(process_vm_readv, address, to, size);
 }
 
 void WriteMemory(std::uint64_t address, const void* from, std::size_t size) {

@@ -21,6 +21,9 @@ struct BadArgument {
 void ReadMemory(std::uint64_t address, void* to, std::size_t size);
 void WriteMemory(std::uint64_t address, const void* from, std::size_t size);
 
+// Whether the memory could be read, all of it. Safe in signal handlers.
+bool TryReadMemory(std::uint64_t address, void* to, std::size_t size) noexcept;
+
 // Makes sure that the memory can be written, without changing it.
 void ProbeWritable(std::uint64_t address, std::size_t size);
 

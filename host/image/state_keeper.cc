@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "host/module/module_error.h"
+#include "host/trace/thread_occupation.h"
 #include "secpolicy/host/host_error.h"
 
 namespace StandIn {
@@ -62,6 +63,7 @@ void StateKeeper::Write() {
 }
 
 void StateKeeper::BeginBatch() {
+  const OperationScope scope;  // for signal handlers it is one
   batch_.emplace(file_);
   try {
     Refresh();
@@ -74,6 +76,7 @@ void StateKeeper::BeginBatch() {
 
 void StateKeeper::Commit() {
   if (!batch_) return;
+  const OperationScope scope;
   try {
     if (changedInBatch_) Write();
   } catch (...) {

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "host/trace/operation.h"
+#include "host/trace/thread_occupation.h"
 
 namespace StandIn {
 
@@ -52,9 +53,11 @@ class OperationPoint {
   void Add(OperationHook& hook) { hooks_.push_back(&hook); }
 
   // Runs `action`, surrounded by the hooks, and returns what it returns. `words` yields the
-  // operation's arguments as text.
+  // operation's arguments as text. Throws ModuleError EDEADLK within another operation of the
+  // thread.
   template <typename Words, typename Action>
   auto Pass(Operation operation, const Words& words, const Action& action) const {
+    const OperationScope scope;
     const OperationCall call{operation, Callable<std::string>(words)};
     using Result = std::invoke_result_t<Action>;
     if constexpr (std::is_void_v<Result>) {
