@@ -62,7 +62,8 @@ long IssuePrivateCall(ZekCtl::Kernel::PrivateCall number, CallArgument first, Ca
   // The error value is 32 bits wide, however the kernel fills the rest of the register.
   const auto error =
       static_cast<int>(IsOrdinaryError(result.status) ? result.status : result.error);
-  if (error != 0) errno = -error;
+  // Negated as a number without a sign: the lowest value has no negation, and stays what it is.
+  if (error != 0) errno = static_cast<int>(0U - static_cast<unsigned int>(error));
   return result.status;
 }
 

@@ -126,6 +126,9 @@ TEST_F(RegistersTest, TheStatusAloneDecidesAndTheErrorValueGivesTheReason) {
       // The value is of 32 bits, whatever the kernel leaves above.
       {{1, 0xfffffff3}, "failed: " + denied},
       {{1, 0x100000000}, "failed: " + before},
+      // The one value whose negation has no place in an int stays as it is.
+      {{1, -2147483648L}, "failed: Unknown error -2147483648"},
+      {{1, 2147483647L}, "failed: Unknown error -2147483647"},
       // An ordinary kernel has no second register.
       {{-ENOSYS, 12345}, "failed: Function not implemented"},
       {{-4095, 0}, "failed: Unknown error 4095"},
