@@ -1,14 +1,10 @@
 #include "core/directory_stream.h"
 
-#include <cerrno>
 #include <string_view>
 
 namespace SecPolicy {
 
-DirectoryStream::DirectoryStream(const std::string& path) {
-  errno = 0;
-  directory_.reset(opendir(path.c_str()));
-}
+DirectoryStream::DirectoryStream(const std::string& path) : directory_(opendir(path.c_str())) {}
 
 std::optional<DirectoryEntry> DirectoryStream::Next() {
   while (const dirent64* entry = readdir64(directory_.get())) {

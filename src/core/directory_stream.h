@@ -17,7 +17,8 @@ struct DirectoryEntry {
 // An open directory, closed with this object.
 class DirectoryStream {
  public:
-  // Sets errno to 0 and opens `path`. Where that fails, IsOpen() is false and errno says why.
+  // Opens `path`. Where that fails, IsOpen() is false and errno says why; else errno stays as it
+  // is.
   explicit DirectoryStream(const std::string& path);
 
   [[nodiscard]] bool IsOpen() const noexcept { return directory_ != nullptr; }

@@ -60,6 +60,7 @@ void GetTardiskLists(std::string policyDir, std::list<TardiskPolicy*>& withPolic
                      std::list<std::string>& withoutPolicy) {
   std::list<std::string> remaining;
   GetAllTardisks(remaining);
+  errno = 0;
   DirectoryStream directory(policyDir);
   if (!directory.IsOpen()) {
     if (errno != ENOENT) {

@@ -7,6 +7,7 @@
 #include <sys/un.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <climits>
 #include <filesystem>
 
@@ -45,6 +46,14 @@ class GetFileListTest : public testing::Test {
 
   StandIn::TemporaryDirectory directory_;
 };
+
+// A failing private call without an error value quotes it later.
+TEST_F(GetFileListTest, LeavesErrnoAsItIs) {
+  Write("a");
+  errno = EDOM;
+  Listed(directory_.Path());
+  EXPECT_EQ(errno, EDOM);
+}
 
 // ---- Names -------------------------------------------------------------------------------------
 

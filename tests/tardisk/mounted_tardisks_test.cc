@@ -1,6 +1,8 @@
 // Listing the mounted tardisks.
 #include <dirent.h>
 
+#include <cerrno>
+
 #include "tardisk/tardisk_discovery.h"
 #include "tests/support/file_system_answers.h"
 #include "tests/support/open_descriptors.h"
@@ -46,6 +48,17 @@ TEST_F(MountedTardisksTest, EmptyDirectoryHasNone) {
   const Outcome outcome = GetAll();
   EXPECT_EQ(outcome.value, "/tardisks/before\n");
   EXPECT_THAT(outcome.events, IsEmpty());
+}
+
+TEST_F(MountedTardisksTest, ErrnoStaysAsItIs) {
+  PlainTardisks({"base"});
+  const Outcome outcome = Run([] {
+    std::list<std::string> tardisks;
+    errno = EDOM;
+    SecPolicy::GetAllTardisks(tardisks);
+    return errno;
+  });
+  EXPECT_EQ(outcome.value, std::to_string(EDOM));
 }
 
 TEST_F(MountedTardisksTest, HiddenFileIsATardisk) {
