@@ -31,12 +31,12 @@ class OpenFile {
   int descriptor_;
 };
 
-ZekCtl::Util::InodeStats ReadInodeStats(unsigned long inode) {
-  ZekCtl::Util::InodeStats stats{};
+// The reply is whole only when the accessor is gone: so the caller's record is filled, and none is
+// handed back by value, which a compiler may copy before that.
+void ReadInodeStats(unsigned long inode, ZekCtl::Util::InodeStats& stats) {
   ZekCtl::Util::Sysinfo service(ZekCtl::Util::kInodeStatsNode);
   service.AddInstancePath(inode);
   service.Get(&stats, sizeof stats);
-  return stats;
 }
 
 }  // namespace
@@ -47,7 +47,8 @@ std::string BackingTardiskPath(const std::string& policyFile) {
   if (fstat(file.Descriptor(), &attributes) != 0) {
     throw TavonException("Unable to get attributes for policy file " + policyFile);
   }
-  const ZekCtl::Util::InodeStats stats = ReadInodeStats(attributes.st_ino);
+  ZekCtl::Util::InodeStats stats{};
+  ReadInodeStats(attributes.st_ino, stats);
   // The reply is not trusted to end in a NUL.
   const std::string_view field(stats.tardiskName, sizeof stats.tardiskName);
   const std::string_view name = field.substr(0, field.find('\0'));
