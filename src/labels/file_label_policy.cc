@@ -49,8 +49,11 @@ void FileLabelPolicy::ParsePolicy(std::string path, ZekAccessInterfaceImpl& ifac
 
 void FileLabelPolicy::SetFileLabels(ZekAccessInterfaceImpl& iface) {
   bool allSet = true;
-  for (; !labels_.empty(); labels_.pop_front()) {
-    allSet &= SucceedsOrLogs([&] { Apply(labels_.front(), iface); });
+  while (!labels_.empty()) {
+    // Taken out first, so that it is gone after its attempt however that ends.
+    const FileLabel mapping = std::move(labels_.front());
+    labels_.pop_front();
+    allSet &= SucceedsOrLogs([&] { Apply(mapping, iface); });
   }
   if (!allSet) throw TavonException("There was a failure in setting file labels");
 }

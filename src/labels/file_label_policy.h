@@ -26,7 +26,8 @@ class FileLabelPolicy {
   // lines before stay.
   void ParsePolicy(std::string path, ZekAccessInterfaceImpl& iface);
 
-  // Applies the mappings in order and forgets each after its attempt. A failure is logged, with the
+  // Applies the mappings in order and forgets each after its attempt, whatever that throws; what is
+  // no TavonException leaves the mappings behind it to the next call. A failure is logged, with the
   // mapping's file and line in front, and the next one is applied. Throws "There was a failure in
   // setting file labels" if any failed.
   void SetFileLabels(ZekAccessInterfaceImpl& iface);

@@ -1,7 +1,10 @@
 // File-label files: a path, or a tree, and its label.
 #include "labels/file_label_policy.h"
 
+#include <new>
+
 #include "tests/labels/labels_fixture.h"
+#include "tests/support/counted_memory.h"
 
 namespace SecPolicyTest {
 namespace {
@@ -155,6 +158,32 @@ TEST_F(FileLabelPolicyTest, NothingIsLeftToSetAfterwards) {
                           "kernel: lookup-label object web", "kernel: set-file-label /opt/y web",
                           "kernel: lookup-label object web", testing::StartsWith("error: "),
                           "info: second time"));
+}
+
+// An exception that is not the library's ends the attempts, and counts as the end of one.
+TEST_F(FileLabelPolicyTest, MappingIsGoneWhateverEndedItsAttempt) {
+  const std::string label = "label-that-needs-memory-of-its-own";
+  Define({label});
+  Policy("fileLabels/x", "/opt/y " + label + "\n/opt/z " + label + "\n");
+  const Outcome outcome = RunWithInterface([&](auto& iface) {
+    FileLabelPolicy policy;
+    policy.ParsePolicy(PolicyPath("fileLabels/x"), iface);
+    std::string failure = "nothing";
+    FailAllocation(0);
+    try {
+      policy.SetFileLabels(iface);
+    } catch (const std::bad_alloc&) {
+      FailNoAllocation();
+      failure = "no memory";
+    }
+    FailNoAllocation();
+    policy.SetFileLabels(iface);
+    return failure;
+  });
+  EXPECT_EQ(outcome.error, "");
+  EXPECT_EQ(outcome.value, "no memory");
+  EXPECT_THAT(outcome.Operations({"set-file-label"}),
+              ElementsAre("set-file-label /opt/z " + label));
 }
 
 TEST_F(FileLabelPolicyTest, EmptyPolicySetsNothing) {
