@@ -117,9 +117,9 @@ long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments)
 }
 
 long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
-  const auto& [path, name, value, size, flags, unused] = arguments;
-  return AsResult([&, path = path, name = name, value = value, size = size,
-                   flags = flags]() -> long {
+  const std::uint64_t path = arguments[0], name = arguments[1], value = arguments[2];
+  const std::uint64_t size = arguments[3], flags = arguments[4];
+  return AsResult([&]() -> long {
     LabelId label = 0;
     const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}, {value, sizeof label}});
     if (!NamesLabel(memory, name)) {
@@ -135,8 +135,9 @@ long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments
 }
 
 long AnswerGetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
-  const auto& [path, name, value, size, unused1, unused2] = arguments;
-  return AsResult([&, path = path, name = name, value = value, size = size]() -> long {
+  const std::uint64_t path = arguments[0], name = arguments[1], value = arguments[2];
+  const std::uint64_t size = arguments[3];
+  return AsResult([&]() -> long {
     const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}});
     if (!NamesLabel(memory, name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
     const auto labelledPath = LabelledPath(host, memory, path);

@@ -57,9 +57,9 @@ std::size_t Edits(const std::string& a, const std::string& b) {
 
 }  // namespace
 
-const WordTable& TableOf(const std::string& title) {
+const WordTable& TableOf(std::string_view title) {
   static const std::map<std::string, WordTable> tables = MakeTables();
-  return tables.at(title);
+  return tables.at(std::string(title));
 }
 
 std::string UnknownWord(const WordTable& table, const std::string& word) {

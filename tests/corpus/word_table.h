@@ -2,6 +2,7 @@
 #pragma once
 
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace SecPolicyTest {
@@ -13,7 +14,7 @@ struct WordTable {
 };
 
 // The lists of the default host, by the title.
-const WordTable& TableOf(const std::string& title);
+const WordTable& TableOf(std::string_view title);
 
 // The objects and domains that the corpus's kernel has: the predefined ones, and these.
 inline const std::vector<std::string> kCorpusObjects{"logs", "netConf", "webUi-conf"};
