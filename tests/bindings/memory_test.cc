@@ -1,4 +1,9 @@
 // The memory that calls take: that they give it back, and what they say when there is none.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <string>
+
 #include "secpolicy/secpolicy_c.h"
 #include "tests/host/image/temporary_directory.h"
 #include "tests/support/counted_memory.h"
