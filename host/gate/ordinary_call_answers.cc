@@ -117,8 +117,11 @@ long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments)
 }
 
 long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
-  const std::uint64_t path = arguments[0], name = arguments[1], value = arguments[2];
-  const std::uint64_t size = arguments[3], flags = arguments[4];
+  const std::uint64_t path = arguments[0];
+  const std::uint64_t name = arguments[1];
+  const std::uint64_t value = arguments[2];
+  const std::uint64_t size = arguments[3];
+  const std::uint64_t flags = arguments[4];
   return AsResult([&]() -> long {
     LabelId label = 0;
     const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}, {value, sizeof label}});
@@ -135,7 +138,9 @@ long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments
 }
 
 long AnswerGetAttribute(const AttachedHost& host, const CallArguments& arguments) noexcept {
-  const std::uint64_t path = arguments[0], name = arguments[1], value = arguments[2];
+  const std::uint64_t path = arguments[0];
+  const std::uint64_t name = arguments[1];
+  const std::uint64_t value = arguments[2];
   const std::uint64_t size = arguments[3];
   return AsResult([&]() -> long {
     const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}});

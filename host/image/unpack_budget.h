@@ -9,7 +9,7 @@ namespace StandIn {
 // Far above what a root file system takes, far below what a decompression bomb makes.
 inline constexpr std::uint64_t kMaxUnpackedBytes = std::uint64_t{64} << 30;
 inline constexpr std::uint64_t kMaxEntries = 4'000'000;
-inline constexpr std::uint64_t kMaxPathBytes = std::uint64_t{512} << 20;
+inline constexpr std::uint64_t kMaxPathBytesInAll = std::uint64_t{512} << 20;
 inline constexpr std::uint64_t kMaxDepth = 256;
 
 struct UnpackLimits {
@@ -19,7 +19,7 @@ struct UnpackLimits {
   // Of all archives together, the directories included that only the names of others imply.
   std::uint64_t entries = kMaxEntries;
   // The lengths of the paths of all these; they are kept in memory until the image is complete.
-  std::uint64_t pathBytes = kMaxPathBytes;
+  std::uint64_t pathBytes = kMaxPathBytesInAll;
   // Components of one path.
   std::uint64_t depth = kMaxDepth;
 };

@@ -2,6 +2,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <string>
 
 #include "secpolicy/secpolicy_c.h"
@@ -17,6 +18,7 @@ class MemoryTest : public testing::Test {
     EXPECT_EQ(secpolicy_host_create(path_.c_str(), nullptr), SECPOLICY_OK);
     EXPECT_EQ(secpolicy_host_open(path_.c_str(), &host_, nullptr), SECPOLICY_OK);
     EXPECT_EQ(secpolicy_host_assemble(host_, nullptr), SECPOLICY_OK);
+    std::filesystem::create_directory(empty_);
   }
   ~MemoryTest() override { secpolicy_host_free(host_); }
 
@@ -37,7 +39,10 @@ class MemoryTest : public testing::Test {
     secpolicy_text_free(text);
     EXPECT_EQ(secpolicy_who(policy, words, 2, &text, &error), SECPOLICY_OK);
     secpolicy_text_free(text);
-    EXPECT_EQ(secpolicy_load(host, "/none", &text, &error), SECPOLICY_LOAD_TERMINATED);
+    EXPECT_EQ(secpolicy_load(host, empty_.c_str(), &text, &error), SECPOLICY_LOAD_TERMINATED);
+    secpolicy_text_free(text);
+    secpolicy_error_free(error);
+    EXPECT_EQ(secpolicy_load(host, "/none", &text, &error), SECPOLICY_FAILED);
     secpolicy_text_free(text);
     secpolicy_error_free(error);
     EXPECT_EQ(secpolicy_may(policy, "none", words, 2, &text, &error), SECPOLICY_BAD_REQUEST);
@@ -51,6 +56,7 @@ class MemoryTest : public testing::Test {
 
   StandIn::TemporaryDirectory directory_;
   std::string path_ = directory_ / "host";
+  std::string empty_ = directory_ / "policy";
   secpolicy_host* host_ = nullptr;
 };
 

@@ -176,7 +176,7 @@ TEST_F(DomainLoadingTest, AFileThatCannotBeReadFailsItsDomainOnly) {
     FileRemover remover(PolicyPath("domains/aDom"));
     StandIn::OperationPoint point;
     point.Add(remover);
-    StandIn::ObservedModule module(StandIn::Attached()->module, point);
+    StandIn::ObservedModule module(StandIn::Attached()->unobserved, point);
     const StandIn::AttachedHost host{module, StandIn::Attached()->point, module,
                                      StandIn::Attached()->files};
     StandIn::Attach(&host);

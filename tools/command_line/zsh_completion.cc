@@ -7,7 +7,7 @@ namespace {
 
 // `text` within single quotes, as part of what _arguments takes, in which some characters
 // mean something.
-std::string Escaped(const std::string& text) {
+std::string QuotedForZsh(const std::string& text) {
   std::string escaped;
   for (const char c : text) {
     if (c == '\'') {
@@ -24,7 +24,7 @@ std::string Escaped(const std::string& text) {
 // What zsh is to offer for a value: its message and its action.
 std::string Action(const CommandOption& option) {
   const bool isPositional = !option.names[0].starts_with('-');
-  std::string action = ":" + Escaped(isPositional ? option.names[0] : option.value) + ":";
+  std::string action = ":" + QuotedForZsh(isPositional ? option.names[0] : option.value) + ":";
   if (!option.choices.empty()) {
     action += "(";
     for (const std::string& choice : option.choices) action += choice + " ";
@@ -42,7 +42,7 @@ std::string Action(const CommandOption& option) {
 std::string OptionSpecs(const CommandOption& option) {
   std::string specs;
   for (const std::string& name : option.names) {
-    specs += " \\\n    '*" + name + "[" + Escaped(option.description) + "]" +
+    specs += " \\\n    '*" + name + "[" + QuotedForZsh(option.description) + "]" +
              (option.value.empty() ? "" : Action(option)) + "'";
   }
   return specs;
@@ -68,7 +68,7 @@ std::string Functions(const CommandLine& line, const std::string& name) {
   std::string cases;
   for (const CommandLine& verb : line.verbs) {
     const std::string function = name + "_" + verb.name;
-    text += "      '" + verb.name + ":" + Escaped(verb.description) + "'\n";
+    text += "      '" + verb.name + ":" + QuotedForZsh(verb.description) + "'\n";
     cases += "      " + verb.name + ") " + function + " ;;\n";
     below += Functions(verb, function);
   }

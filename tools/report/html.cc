@@ -8,7 +8,7 @@ namespace SecPolicyTool {
 
 namespace {
 
-std::string Escaped(const std::string& text) {
+std::string EscapedMarkup(const std::string& text) {
   std::string escaped;
   for (const char c : StandIn::Escaped(text).Text()) {
     switch (c) {
@@ -37,14 +37,14 @@ std::string Escaped(const std::string& text) {
 std::string StartTag(const char* tag, const std::vector<Attribute>& attributes) {
   std::string start = std::string("<") + tag;
   for (const Attribute& attribute : attributes) {
-    start += std::string(" ") + attribute.name + "=\"" + Escaped(attribute.value) + "\"";
+    start += std::string(" ") + attribute.name + "=\"" + EscapedMarkup(attribute.value) + "\"";
   }
   return start + ">";
 }
 
 }  // namespace
 
-Html::Html(const std::string& text) : markup_(Escaped(text)) {}
+Html::Html(const std::string& text) : markup_(EscapedMarkup(text)) {}
 
 Html Html::TrustedMarkup(std::string markup) {
   Html html;

@@ -70,7 +70,7 @@ CommandOption JsonOption(bool& isJson) {
 }
 
 void AddChangeOptions(CommandLine& verb, StandIn::ChangeOptions& changes) {
-  constexpr std::int64_t kLongestWait = 24 * 60 * 60;
+  constexpr std::int64_t kLongestWait = std::chrono::seconds(std::chrono::hours(24)).count();
   verb.options.push_back({.names = {"--wait"},
                           .value = "SECONDS",
                           .description = "Wait so long for another process that changes the host",
