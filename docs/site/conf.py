@@ -2,6 +2,7 @@
 
 import pathlib
 import re
+import sys
 
 REPOSITORY = pathlib.Path(__file__).resolve().parent.parent.parent
 
@@ -10,7 +11,7 @@ release = re.search(r"project\(SecPolicy VERSION (\S+)",
                     (REPOSITORY / "CMakeLists.txt").read_text())[1]
 html_title = f"{project} {release}"
 
-extensions = ["myst_parser", "breathe"]
+extensions = ["myst_parser", "breathe", "sphinx.ext.autodoc"]
 source_suffix = {".md": "markdown"}
 root_doc = "index"
 language = "en"
@@ -24,6 +25,13 @@ breathe_default_project = "secpolicy"
 breathe_domain_by_extension = {"h": "cpp"}
 breathe_domain_by_file_pattern = {"*_c.h": "c"}
 breathe_show_include = False
+
+# The Python package is imported from the sources; its docstrings mark code with single backticks.
+sys.path.insert(0, str(REPOSITORY / "bindings" / "python"))
+default_role = "literal"
+autoclass_content = "both"
+autodoc_member_order = "bysource"
+python_use_unqualified_type_names = True
 
 pygments_style = "default"
 pygments_dark_style = "github-dark"
@@ -40,3 +48,5 @@ html_show_search_summary = False
 html_show_sourcelink = False
 html_show_sphinx = False
 html_show_copyright = False
+# The package has one module.
+html_domain_indices = False

@@ -1,5 +1,6 @@
 """The Markdown documents of the repository, made ready for the site."""
 
+import json
 import os
 import re
 import shutil
@@ -11,8 +12,13 @@ FIRST = "README.md"
 # Files and folders of the sources whose place the reference takes.
 INSTEAD = {
     "include/secpolicy/secpolicy.h": "reference/SecPolicy.md",
+    "include/secpolicy/secpolicy_c.h": "reference/C-interface.md",
+    "bindings/python": "reference/python.md",
     "src/platform": "reference/index.md",
 }
+
+# What the pages of folders that documents link to are called.
+FOLDER_TITLES = {"abi": "The binary interface", "docs/schemas": "JSON schemas"}
 
 LINK = re.compile(r"(?<!!)\[([^\]]*)\]\(([^)\s]+)\)")
 
@@ -23,6 +29,13 @@ class SiteError(Exception):
 
 def name_in_site(path):
     return "index.md" if path == FIRST else path
+
+
+def title_of(file):
+    """What a file calls itself, or else its name."""
+    if file.suffix == ".json":
+        return json.loads(file.read_text()).get("title", file.name)
+    return file.name
 
 
 class Staging:
@@ -44,12 +57,14 @@ class Staging:
         if folder in self.folders:
             return page
         self.folders.append(folder)
-        lines = [f"# {folder}", ""]
+        if folder not in FOLDER_TITLES:
+            raise SiteError(f"docs/site/documents.py: FOLDER_TITLES has no title for {folder}")
+        lines = [f"# {FOLDER_TITLES[folder]}", ""]
         for file in sorted((self.repository / folder).rglob("*")):
             if file.is_file() and file.name != "index.md":
                 self.copy(str(file.relative_to(self.repository)))
                 name = file.relative_to(self.repository / folder)
-                lines.append(f"- [{name}]({name})")
+                lines.append(f"- [{title_of(file)}]({name})")
         (self.source / page).write_text("\n".join(lines) + "\n")
         return page
 

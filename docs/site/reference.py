@@ -8,8 +8,18 @@ import xml.etree.ElementTree as ElementTree
 
 from documents import SiteError
 
-# Folders of headers in the order in which they are shown, as they are included.
-FOLDERS = ["include/secpolicy", "include/secpolicy/host", "src/platform"]
+# Folders of headers in the order in which they are shown, and where they are installed.
+FOLDERS = {
+    "include/secpolicy": "secpolicy",
+    "include/secpolicy/host": "secpolicy/host",
+    "src/platform": "secpolicy/platform",
+}
+
+# Headers with a page of their own, which have no namespace to be found by.
+TITLES = {"secpolicy/secpolicy_c.h": "C interface"}
+
+# "---- Title ----" in a comment of C, on a line of its own.
+TITLE_IN_C = re.compile(r"^/\* -{4,} (.*?) -{2,} \*/$")
 
 
 def undocumented_enumerators(xml):
@@ -71,8 +81,28 @@ def compound(file):
     return ElementTree.parse(file).getroot().find("compounddef")
 
 
+def line_of(described):
+    return int(described.find("location").get("line"))
+
+
 def directive(kind, name, *options):
     return f"```{{eval-rst}}\n.. doxygen{kind}:: {name}\n{''.join(options)}```\n"
+
+
+class CHeader:
+    """A header of C, in its own order and with its own titles."""
+
+    def __init__(self, file, path):
+        found = compound(file)
+        parts = [(number, f"## {title[1]}\n")
+                 for number, line in enumerate(path.read_text().splitlines(), 1)
+                 if (title := TITLE_IN_C.match(line))]
+        for inner in found.findall("innerclass"):
+            one = compound(file.parent / f"{inner.get('refid')}.xml")
+            parts.append((line_of(one), directive(one.get("kind"), inner.text, "   :members:\n")))
+        for member in found.iter("memberdef"):
+            parts.append((line_of(member), directive(member.get("kind"), member.findtext("name"))))
+        self.parts = [part for _, part in sorted(parts)]
 
 
 class Namespace:
@@ -81,12 +111,14 @@ class Namespace:
     def __init__(self, file, xml):
         found = compound(file)
         self.name = found.findtext("compoundname")
+        texts = [found.find(part) for part in ("briefdescription", "detaileddescription")]
+        self.purpose = " ".join("".join(text.itertext()).strip() for text in texts).strip()
         self.places = set()
         self.parts = []
         types = [compound(xml / f"{inner.get('refid')}.xml") for inner in found.findall("innerclass")]
         if types:
             self.parts.append("## Types\n")
-        for one in sorted(types, key=lambda one: int(one.find("location").get("line"))):
+        for one in sorted(types, key=line_of):
             self.add(one, one.get("kind"), one.findtext("compoundname"), "   :members:\n")
         for section in found.findall("sectiondef"):
             if section.find("header") is not None:
@@ -114,10 +146,10 @@ def top_of(header):
 
 
 def headers(repository):
-    """All headers in their order: what one writes to include them, and the text at their top."""
-    for folder in FOLDERS:
+    """All headers in their order: what one writes to include them, and their files."""
+    for folder, installed in FOLDERS.items():
         for path in sorted((repository / folder).glob("*.h")):
-            yield str(path.relative_to(repository / folder.split("/")[0])), top_of(path)
+            yield f"{installed}/{path.name}", path
 
 
 def stage(repository, xml, source):
@@ -128,19 +160,25 @@ def stage(repository, xml, source):
     namespaces = [Namespace(file, xml) for file in sorted(xml.glob("namespace*.xml"))
                   if not file.name.endswith("_8dox.xml")]
     texts = {}
-    for header, text in headers(repository):
-        shown = [one for one in namespaces if header in one.places and one.is_shown()]
+    for header, path in headers(repository):
+        # Doxygen's places begin below the folders that its settings strip.
+        place = str(path.relative_to(repository)).partition("/")[2]
+        top = f"`<{header}>`: {top_of(path)}\n"
+        shown = [one for one in namespaces if place in one.places and one.is_shown()]
         for one in shown:
-            texts.setdefault(one.name, [[], one.parts])[0].append(f"`<{header}>`: {text}\n")
+            texts.setdefault(one.name, [[], one.parts])[0].append(top)
         if not shown:
-            texts[header] = [[], [directive("file", header)]]
+            file = xml / f"{path.name.replace('_', '__').replace('.', '_8')}.xml"
+            texts[TITLES[header]] = [[top], CHeader(file, path).parts]
     (source / "reference").mkdir()
     index = [(repository / "docs/site/reference.md").read_text(), ""]
     names = []
+    purposes = {one.name: f": {one.purpose}" for one in namespaces}
     for title, (tops, parts) in texts.items():
-        names.append(title.replace("::", "-").replace("/", "-").removesuffix(".h"))
+        names.append(title.replace("::", "-").replace(" ", "-"))
         (source / f"reference/{names[-1]}.md").write_text(
             "\n".join([f"# {title}\n", *tops, *parts]))
-        index.append(f"- [{title}]({names[-1]}.md)")
-    index += ["", "```{toctree}", ":hidden:", "", *names, "```", ""]
+        index.append(f"- [{title}]({names[-1]}.md){purposes.get(title, '')}")
+    names.append("python")
+    index += ["- [Python package](python.md)", "", "```{toctree}", ":hidden:", "", *names, "```", ""]
     (source / "reference/index.md").write_text("\n".join(index))
