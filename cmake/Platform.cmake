@@ -1,5 +1,6 @@
 # Which platform the library is linked with: SECPOLICY_PLATFORM_SHARED and SECPOLICY_PLATFORM_STATIC
-# are what its two forms are linked with.
+# are what its two forms are linked with, SECPOLICY_PLATFORM_ITEMS an external one's libraries as those
+# who link with what is installed name them.
 set(SECPOLICY_PLATFORM stand-in CACHE STRING
   "Platform: stand-in (the stand-in host) or external (a target's library)")
 set_property(CACHE SECPOLICY_PLATFORM PROPERTY STRINGS stand-in external)
@@ -38,6 +39,27 @@ function(secpolicy_require_platform_classes)
   endif()
 endfunction()
 
+# Sets `build` and `installed` to what `library` is linked by, here and by those who link with what is
+# installed. The linker writes the path of a shared library without a SONAME into what it makes, if it is
+# given a path; so such a library is named by its file's name, and searched for.
+function(secpolicy_platform_items library build installed)
+  set(soname yes)
+  if(IS_ABSOLUTE "${library}" AND library MATCHES "\\.so[0-9.]*$")
+    execute_process(COMMAND ${CMAKE_READELF} -dW ${library}
+      OUTPUT_VARIABLE dynamic ERROR_QUIET COMMAND_ERROR_IS_FATAL ANY)
+    string(FIND "${dynamic}" "(SONAME)" soname)
+  endif()
+  if(soname STREQUAL "-1")
+    cmake_path(GET library PARENT_PATH folder)
+    cmake_path(GET library FILENAME name)
+    set(${installed} "-l:${name}" PARENT_SCOPE)
+    set(${build} "$<BUILD_INTERFACE:-L${folder}>" "-l:${name}" PARENT_SCOPE)
+  else()
+    set(${installed} "${library}" PARENT_SCOPE)
+    set(${build} "${library}" PARENT_SCOPE)
+  endif()
+endfunction()
+
 if(SECPOLICY_PLATFORM STREQUAL "stand-in")
   if(SECPOLICY_PLATFORM_LIBRARY)
     message(FATAL_ERROR "SECPOLICY_PLATFORM_LIBRARY is for SECPOLICY_PLATFORM=external")
@@ -53,8 +75,12 @@ elseif(SECPOLICY_PLATFORM STREQUAL "external")
     secpolicy_require_platform_library("${library}")
   endforeach()
   secpolicy_require_platform_classes()
-  set(SECPOLICY_PLATFORM_SHARED ${SECPOLICY_PLATFORM_LIBRARY})
-  set(SECPOLICY_PLATFORM_STATIC ${SECPOLICY_PLATFORM_LIBRARY})
+  foreach(library IN LISTS SECPOLICY_PLATFORM_LIBRARY)
+    secpolicy_platform_items("${library}" build installed)
+    list(APPEND SECPOLICY_PLATFORM_SHARED ${build})
+    list(APPEND SECPOLICY_PLATFORM_ITEMS ${installed})
+  endforeach()
+  set(SECPOLICY_PLATFORM_STATIC ${SECPOLICY_PLATFORM_SHARED})
 else()
   message(FATAL_ERROR
     "SECPOLICY_PLATFORM is \"${SECPOLICY_PLATFORM}\": it can be stand-in or external")

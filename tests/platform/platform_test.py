@@ -243,6 +243,32 @@ class Load(PlatformTest):
         for program in ("loader", "loader_static"):
             self.check(build / program, self.write("policy", POLICY), "load.txt")
 
+    def test_no_path_of_a_platform_without_soname_is_kept(self) -> None:
+        """Neither the linker nor those who link later get to see where it lay."""
+        place = self.work / "bare"
+        place.mkdir()
+        bare = place / "libplatform.so"
+        done(COMPILER, *FLAGS, "-shared", "-fPIC", f"-I{SOURCE / 'src'}", HERE / "recorder.cc",
+             "-o", bare)
+        result = configure(self.build, f"-DSECPOLICY_PLATFORM_LIBRARY={bare}")
+        self.assertEqual(result.returncode, 0, result.stderr)
+        done(CMAKE, "--build", self.build, "--parallel", 2)
+        prefix = self.work / "bare-prefix"
+        done(CMAKE, "--install", self.build, "--prefix", prefix)
+        for file in prefix.rglob("*"):
+            if file.is_file():
+                self.assertNotIn(str(place).encode(), file.read_bytes(), file)
+        dynamic = done("readelf", "-dW", prefix / "lib" / "libsecpolicy.so").stdout
+        self.assertIn("Shared library: [libplatform.so]", dynamic)
+        # Beside the library it is found, by the linker and by the loader.
+        bare.rename(prefix / "lib" / bare.name)
+        flags = done("pkg-config", "--cflags", "--libs", "secpolicy",
+                     PKG_CONFIG_PATH=prefix / "lib" / "pkgconfig").stdout.split()
+        program = self.work / "bare-loader"
+        done(COMPILER, *FLAGS, HERE / "loader.cc", "-o", program, *flags,
+             f"-Wl,-rpath,{prefix / 'lib'}")
+        self.assertIn("platform: open", done(program, self.write("policy", POLICY)).stderr)
+
 
 if __name__ == "__main__":
     unittest.main(argv=[sys.argv[0], *sys.argv[3:]])
