@@ -227,7 +227,7 @@ TEST_F(WellKnownDomainsTest, LoadThatEndsBeforeTheLookUpsLeavesTheIdsOfTheLastOn
 
 // A load looks up each of its three domains, then the three well-known ones, then a tardisk's.
 TEST_F(WellKnownDomainsTest, RefusedLookUpLeavesTheIdsOfTheLastLoad) {
-  for (const std::uint64_t call : {11, 12, 13}) {
+  for (const std::uint64_t call : {11U, 12U, 13U}) {
     SCOPED_TRACE(call);
     FailNothing();
     Fail(Operation::kFindDomain, call);

@@ -54,7 +54,7 @@ TEST_F(StateFileTest, NothingIsThereBeforeTheFirstWrite) {
 
 // A host that root loaded can be read by whoever may read its directory.
 TEST_F(StateFileTest, IsReadableWhateverTheMask) {
-  for (const mode_t mask : {0000, 0022, 0077, 0777}) {
+  for (const mode_t mask : {0000U, 0022U, 0077U, 0777U}) {
     const mode_t before = ::umask(mask);
     state_.Write("text");
     ::umask(before);

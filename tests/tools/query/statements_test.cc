@@ -19,7 +19,7 @@ Policy Tested() {
   return policy;
 }
 
-Vocabulary Words() {
+Vocabulary StatementWords() {
   Vocabulary words;
   words.lists = {{StandIn::WordList::kSyscalls, {"open", "read"}},
                  {StandIn::WordList::kObjects, {"program"}},
@@ -30,7 +30,7 @@ Vocabulary Words() {
 }
 
 StatementFile Parse(const std::string& text) {
-  return ParseStatements(ReadPolicyText(text), Words(),
+  return ParseStatements(ReadPolicyText(text), StatementWords(),
                          [](const std::string& path) { return path; });
 }
 
