@@ -46,6 +46,15 @@ class HostLockTest : public HostFixture {
     ASSERT_EQ(::chmod(LockPath().c_str(), mode), 0);
   }
 
+  // Whether the child makes the file; one that fails before never does.
+  [[nodiscard]] bool Appears(const std::string& name) const {
+    const auto end = steady_clock::now() + seconds(60);
+    while (!Exists(name) && steady_clock::now() < end) {
+      std::this_thread::sleep_for(milliseconds(1));
+    }
+    return Exists(name);
+  }
+
   StateFile state_{Host()};
 };
 
@@ -87,7 +96,7 @@ TEST_F(HostLockTest, HolderIsNamed) {
     WriteBytes(Path("held"), "");
     ::pause();
   });
-  while (!Exists("held")) std::this_thread::sleep_for(milliseconds(1));
+  ASSERT_TRUE(Appears("held"));
   EXPECT_EQ(ErrorAfter(seconds(0)), HeldBy("process " + std::to_string(holder), 0));
   ::kill(holder, SIGKILL);
   EXPECT_FALSE(ChildPassed(holder));
@@ -104,7 +113,7 @@ TEST_F(HostLockTest, HolderOfAnotherKindOfLockIsNamed) {
     WriteBytes(Path("held"), "");
     ::pause();
   });
-  while (!Exists("held")) std::this_thread::sleep_for(milliseconds(1));
+  ASSERT_TRUE(Appears("held"));
   EXPECT_EQ(ErrorAfter(seconds(0)), HeldBy("process " + std::to_string(holder), 0));
   ::kill(holder, SIGKILL);
   EXPECT_FALSE(ChildPassed(holder));
