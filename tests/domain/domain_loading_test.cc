@@ -2,7 +2,6 @@
 #include <filesystem>
 
 #include "host/attached_host.h"
-#include "host/trace/observed_module.h"
 #include "tests/domain/domain_fixture.h"
 
 namespace SecPolicyTest {
@@ -173,13 +172,10 @@ TEST_F(DomainLoadingTest, AFileThatCannotBeReadFailsItsDomainOnly) {
   Domain("aDom", "-s openat grant\n");
   Domain("bDom", "-s close grant\n");
   const Outcome outcome = Run([&] {
-    FileRemover remover(PolicyPath("domains/aDom"));
-    StandIn::OperationPoint point;
-    point.Add(remover);
-    StandIn::ObservedModule module(StandIn::Attached()->unobserved, point);
-    const StandIn::AttachedHost host{module, StandIn::Attached()->point, module,
-                                     StandIn::Attached()->files};
-    StandIn::Attach(&host);
+    // The session's own point: an operation within another one would be refused. The hook has to
+    // outlive the session, which ends with this process.
+    static FileRemover remover(PolicyPath("domains/aDom"));
+    const_cast<StandIn::OperationPoint&>(StandIn::Attached()->point).Add(remover);
     SecPolicy::ZekAccessInterfaceImpl iface;
     SecPolicy::LoadPolicyDomains(PolicyPath("domains"), iface);
   });
