@@ -69,4 +69,5 @@ make_root() {
   mount -t proc proc "$root/proc"
   mount -t sysfs -o ro sysfs "$root/sys"
   mount --bind /dev "$root/dev"
+  mount --bind /dev/pts "$root/dev/pts"
 }

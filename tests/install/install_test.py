@@ -290,7 +290,7 @@ class Consumer(Installed):
         (self.place / "CMakeLists.txt").write_text(
             "cmake_minimum_required(VERSION 3.25)\nproject(Documented LANGUAGES CXX)\n" + installed)
         build = self.place / "build"
-        run(CMAKE, "-S", self.place, "-B", build, f"-DCMAKE_CXX_COMPILER={COMPILER}",
+        run(CMAKE, "-G", "Ninja", "-S", self.place, "-B", build, f"-DCMAKE_CXX_COMPILER={COMPILER}",
             f"-DCMAKE_PREFIX_PATH={self.prefix}")
         run(CMAKE, "--build", build)
         run("sh", "-ec", f'cd "$1"\n{command.replace("c++", COMPILER, 1)}', "sh", self.place,
@@ -309,7 +309,7 @@ class Consumer(Installed):
             "cmake_minimum_required(VERSION 3.25)\nproject(Older LANGUAGES NONE)\n"
             "find_package(SecPolicy 0.0 REQUIRED)\n")
         with self.assertRaisesRegex(AssertionError, "requested version\\s+\"0.0\""):
-            run(CMAKE, "-S", project, "-B", self.place / "build",
+            run(CMAKE, "-G", "Ninja", "-S", project, "-B", self.place / "build",
                 f"-DCMAKE_PREFIX_PATH={self.prefix}")
 
 
