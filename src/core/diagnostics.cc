@@ -1,12 +1,10 @@
 #include "core/diagnostics.h"
 
-#include <syslog.h>
-
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
-#include <iostream>
 
+#include "core/log.h"
 #include "platform/tavon_strcat.h"
 
 namespace SecPolicy {
@@ -36,13 +34,9 @@ SecPolicyRetryException::SecPolicyRetryException(const SecPolicyRetryException&)
 
 SecPolicyRetryException::~SecPolicyRetryException() = default;
 
-void SecpolicyInfo(std::string msg) { syslog(LOG_INFO, "%s", msg.c_str()); }
+void SecpolicyInfo(std::string msg) { LogInfo(msg); }
 
-void SecpolicyError(std::string msg) {
-  // In one piece, so that lines of several processes do not mix.
-  std::cerr << StrCat("Error: ", msg, "\n") << std::flush;
-  syslog(LOG_ERR, "Error: %s", msg.c_str());
-}
+void SecpolicyError(std::string msg) { LogError(msg, nullptr); }
 
 void RuleSizeError() { throw TavonException("incorrect number of arguments for this rule type"); }
 
@@ -66,8 +60,6 @@ std::string AtLine(const std::string& file, unsigned int line, const std::string
 }
 
 std::string SystemReason() { return std::strerror(errno); }
-
-void PrintLine(const std::string& text) { std::cout << text << std::endl; }
 
 void LogSummary(bool succeeded, const char* success, const char* failure) {
   succeeded ? SecpolicyInfo(success) : SecpolicyError(failure);

@@ -4,6 +4,7 @@
 #include <string>
 #include <utility>
 
+#include "core/log.h"
 #include "secpolicy/secpolicy.h"
 
 namespace SecPolicy {
@@ -15,9 +16,6 @@ namespace SecPolicy {
 // strerror of errno as it is now.
 [[nodiscard]] std::string SystemReason();
 
-// Writes one line to standard output and flushes it.
-void PrintLine(const std::string& text);
-
 // Runs one item of a stage. A TavonException is logged with SecpolicyError and answered with false,
 // so that the stage goes on with its next item; every other exception passes through.
 template <typename Item>
@@ -26,7 +24,7 @@ template <typename Item>
     std::forward<Item>(item)();
     return true;
   } catch (const Tavon::Lib::TavonException& failure) {
-    SecpolicyError(failure.what());
+    LogError(failure.what(), &failure);
     return false;
   }
 }

@@ -4,8 +4,6 @@
 
 namespace SecPolicy {
 
-DirectoryStream::DirectoryStream(const std::string& path) : directory_(opendir(path.c_str())) {}
-
 std::optional<DirectoryEntry> DirectoryStream::Next() {
   while (const dirent64* entry = readdir64(directory_.get())) {
     const std::string_view name = entry->d_name;

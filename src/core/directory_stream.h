@@ -1,4 +1,4 @@
-// The one door to directory listings.
+// The entries of directories.
 #pragma once
 
 #include <dirent.h>
@@ -17,9 +17,8 @@ struct DirectoryEntry {
 // An open directory, closed with this object.
 class DirectoryStream {
  public:
-  // Opens `path`. Where that fails, IsOpen() is false and errno says why; else errno stays as it
-  // is.
-  explicit DirectoryStream(const std::string& path);
+  // Takes over an open directory, or null, as the functions of core/file_access.h return it.
+  explicit DirectoryStream(DIR* directory) noexcept : directory_(directory) {}
 
   [[nodiscard]] bool IsOpen() const noexcept { return directory_ != nullptr; }
 

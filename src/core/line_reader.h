@@ -8,6 +8,8 @@
 #include <string>
 #include <string_view>
 
+#include "core/file_access.h"
+
 namespace SecPolicy {
 
 // An open file that is read line by line; closed with this object.
@@ -16,8 +18,8 @@ class LineReader {
   // A longer line ends the file: callers rely on that bound.
   static constexpr std::size_t kLongestLine = 1023;
 
-  // Opens `path`; where that fails, IsOpen() is false.
-  explicit LineReader(const std::string& path) { file_.open(path, std::ios::in); }
+  // Opens the policy file `path`; where that fails, IsOpen() is false.
+  explicit LineReader(const std::string& path) : file_(OpenPolicyFile(path)) {}
 
   LineReader(const LineReader&) = delete;
   LineReader& operator=(const LineReader&) = delete;

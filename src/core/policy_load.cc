@@ -1,5 +1,6 @@
 // The entry points and the order of the stages.
 #include "core/diagnostics.h"
+#include "core/well_known_domains.h"
 #include "secpolicy/secpolicy.h"
 
 namespace SecPolicy {
@@ -9,11 +10,6 @@ using Tavon::Lib::TavonException;
 namespace {
 
 constexpr char kSystemPolicyDir[] = "/etc/olvane/secpolicy";
-
-// Written by LoadPolicy alone, read by the getters.
-unsigned int globalVMDomain = 0;
-unsigned int ioFilterDomain = 0;
-unsigned int defaultTardiskDomain = 0;
 
 // The id of a domain without which the host must not go on.
 unsigned int RequireDomain(const char* name, const char* failure, ZekAccessInterfaceImpl& iface) {
@@ -28,13 +24,14 @@ unsigned int RequireDomain(const char* name, const char* failure, ZekAccessInter
 }
 
 void RequireWellKnownDomains(ZekAccessInterfaceImpl& iface) {
-  globalVMDomain =
+  WellKnownDomains& known = KnownDomains();
+  known.globalVM =
       RequireDomain("globalVMDom", "Failed to fetch domainID for global VM Domain", iface);
-  iface.SetGlobalVMDomain(globalVMDomain);
-  ioFilterDomain =
+  iface.SetGlobalVMDomain(known.globalVM);
+  known.ioFilter =
       RequireDomain("ioFilterDom", "Failed to fetch domainID for IOFilter domain", iface);
-  iface.SetIoFilterDomain(ioFilterDomain);
-  defaultTardiskDomain =
+  iface.SetIoFilterDomain(known.ioFilter);
+  known.defaultTardisk =
       RequireDomain("appDom", "Failed to fetch domainID for default tar disk domain", iface);
 }
 
@@ -67,10 +64,10 @@ void DisplayPolicy(std::string selector) {
   DisplayPolicyTardiskLabels(iface);
 }
 
-unsigned int GetGlobalVMDomain() { return globalVMDomain; }
+unsigned int GetGlobalVMDomain() { return KnownDomains().globalVM; }
 
-unsigned int GetIOFilterDomain() { return ioFilterDomain; }
+unsigned int GetIOFilterDomain() { return KnownDomains().ioFilter; }
 
-unsigned int GetDefaultTardiskDomain() { return defaultTardiskDomain; }
+unsigned int GetDefaultTardiskDomain() { return KnownDomains().defaultTardisk; }
 
 }  // namespace SecPolicy

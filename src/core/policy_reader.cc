@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "core/directory_stream.h"
+#include "core/file_access.h"
 #include "core/line_reader.h"
 #include "secpolicy/secpolicy.h"
 
@@ -70,7 +71,7 @@ void ParseFile(std::string path, std::map<unsigned int, std::queue<std::string>>
 }
 
 void GetFileList(std::string dir, std::map<std::string, std::string>& files) {
-  DirectoryStream directory(dir);
+  DirectoryStream directory(OpenPolicyDirectory(dir));
   if (!directory.IsOpen()) throw TavonException("Unable to open policy directory " + dir);
   while (auto entry = directory.Next()) {
     if (entry->type == DT_REG) files[dir + "/" + entry->name] = entry->name;

@@ -1,4 +1,4 @@
-// The kernel's own view of a path.
+// The door to the kernel's own view of a path.
 #pragma once
 
 #include <string>

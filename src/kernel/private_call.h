@@ -1,4 +1,4 @@
-// The one door to the private system calls.
+// The private system calls.
 #pragma once
 
 #include "platform/private_calls.h"

@@ -1,6 +1,9 @@
 // Labels of single files and of directory trees.
+#include <cerrno>
+
 #include "core/diagnostics.h"
 #include "core/directory_stream.h"
+#include "core/file_access.h"
 #include "labels/security_attribute.h"
 #include "platform/tavon_strcat.h"
 
@@ -27,7 +30,9 @@ bool IsLabelled(unsigned char type) {
 }
 
 int LabelFile(const std::string& path, const std::string& label, ZekAccessInterfaceImpl& iface) {
-  const int result = ReplaceLabelId(path, iface.LookupLabel(label, kObjectLabel));
+  const unsigned int id = iface.LookupLabel(label, kObjectLabel);
+  errno = 0;
+  const int result = ReplaceLabelId(path, id);
   if (result < 0) {
     throw TavonException(
         StrCat("Unable to set file label (", label, ") for file ", path, ": ", SystemReason()));
@@ -43,7 +48,7 @@ int SetFileLabel(std::string path, std::string label, ZekAccessInterfaceImpl& if
 
 void SetDirLabelRecursive(std::string dir, std::string label, ZekAccessInterfaceImpl& iface) {
   LabelFile(dir, label, iface);
-  DirectoryStream directory(dir);
+  DirectoryStream directory(OpenRootDirectory(dir));
   if (!directory.IsOpen()) throw TavonException("Unable to open directory " + dir);
   std::string path = dir + "/";
   const std::size_t nameBegin = path.size();
@@ -57,6 +62,7 @@ void SetDirLabelRecursive(std::string dir, std::string label, ZekAccessInterface
 }
 
 std::string GetFileLabel(std::string path, ZekAccessInterfaceImpl& iface) {
+  errno = 0;
   const auto id = ReadLabelId(path);
   if (!id) {
     throw TavonException(StrCat("Unable to get file label for file ", path, ":", SystemReason()));

@@ -2,8 +2,6 @@
 
 #include <sys/xattr.h>
 
-#include <cerrno>
-
 #include "platform/private_calls.h"
 
 namespace SecPolicy {
@@ -11,14 +9,12 @@ namespace SecPolicy {
 using ZekCtl::Kernel::kLabelAttribute;
 
 int ReplaceLabelId(const std::string& path, std::uint32_t id) {
-  errno = 0;
   // Replace only: a file that the platform gave no label is not one that policy may label.
   return setxattr(path.c_str(), kLabelAttribute, &id, sizeof id, XATTR_REPLACE);
 }
 
 std::optional<std::uint32_t> ReadLabelId(const std::string& path) {
   std::uint32_t id = 0;
-  errno = 0;
   if (getxattr(path.c_str(), kLabelAttribute, &id, sizeof id) < 0) return std::nullopt;
   return id;
 }

@@ -1,4 +1,4 @@
-// The one door to the attribute in which a file's label is stored.
+// The door to the attribute in which a file's label is stored.
 #pragma once
 
 #include <cstdint>
@@ -7,7 +7,7 @@
 
 namespace SecPolicy {
 
-// Both follow links, set errno to 0 first and leave the reason of a failure in errno.
+// Both follow links and leave the reason of a failure in errno.
 
 // Replaces the label id that the file carries; a file that carries none fails with ENODATA. Returns
 // setxattr's result, negative for a failure.

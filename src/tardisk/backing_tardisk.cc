@@ -1,11 +1,11 @@
 #include "tardisk/backing_tardisk.h"
 
-#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <string_view>
 
+#include "core/file_access.h"
 #include "platform/sysinfo.h"
 #include "platform/tavon_exception.h"
 
@@ -18,7 +18,7 @@ namespace {
 class OpenFile {
  public:
   explicit OpenFile(const std::string& path)
-      : descriptor_(open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
+      : descriptor_(OpenTardiskPolicyFile(path)) {
     if (descriptor_ < 0) throw TavonException("Unable to open policy file " + path);
   }
   ~OpenFile() { close(descriptor_); }

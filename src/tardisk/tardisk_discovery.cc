@@ -5,6 +5,7 @@
 
 #include "core/diagnostics.h"
 #include "core/directory_stream.h"
+#include "core/file_access.h"
 #include "tardisk/backing_tardisk.h"
 
 namespace SecPolicy {
@@ -49,7 +50,7 @@ void SortPolicyFile(const std::string& path, std::list<TardiskPolicy*>& withPoli
 }  // namespace
 
 void GetAllTardisks(std::list<std::string>& tardisks) {
-  DirectoryStream directory(kTardiskDir);
+  DirectoryStream directory(OpenRootDirectory(kTardiskDir));
   if (!directory.IsOpen()) {
     throw TavonException(std::string("Could not open tardisk dir ") + kTardiskDir);
   }
@@ -61,7 +62,7 @@ void GetTardiskLists(std::string policyDir, std::list<TardiskPolicy*>& withPolic
   std::list<std::string> remaining;
   GetAllTardisks(remaining);
   errno = 0;
-  DirectoryStream directory(policyDir);
+  DirectoryStream directory(OpenRootDirectory(policyDir));
   if (!directory.IsOpen()) {
     if (errno != ENOENT) {
       throw TavonException("Unable to open policy directory for tardisks " + policyDir);
