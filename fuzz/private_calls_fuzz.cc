@@ -8,6 +8,7 @@
 #include "fuzz/support/private_call_facts.h"
 #include "fuzz/support/require.h"
 #include "fuzz/support/small_world.h"
+#include "host/gate/user_memory.h"
 #include "platform/zek_access.h"
 
 namespace {
@@ -124,8 +125,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const PrivateCall call = caller.Number();
     const CallArguments arguments = caller.Arguments();
     memory.Remember();
+    StandIn::UserMemory userMemory;
     const PrivateAnswer answer =
-        StandIn::AnswerPrivateCall(host.Host(), static_cast<long>(call), arguments);
+        StandIn::AnswerPrivateCall(host.Host(), static_cast<long>(call), arguments, userMemory);
     Fuzz::RequireDocumented(call, answer);
     const Fuzz::Results results = Fuzz::ResultsOf(call, arguments);
     Fuzz::Require(memory.IsUnchangedBut(results.address, results.size, results.cell),

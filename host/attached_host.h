@@ -1,4 +1,4 @@
-// The machine that this process uses: what its kernel and its platform libraries are asked for.
+// The kernel that code of this process talks to, and what belongs to it.
 #pragma once
 
 #include <string>
@@ -10,7 +10,8 @@
 
 namespace StandIn {
 
-// What the access library and the gate answer from. Belongs to whoever entered the host.
+// What the access library, the gate and the library's doors answer from. Belongs to whoever opened
+// the kernel or entered the host.
 struct AttachedHost {
   SecurityModule& module;       // every operation passes `point`
   const OperationPoint& point;  // for the operations that are not the module's
@@ -20,11 +21,25 @@ struct AttachedHost {
   std::vector<std::string> visible = {};
 };
 
-// Makes `host` this process's machine; null for none. A process has one kernel, so this is the one
-// thing here that is process-wide. Not to be called while another thread uses the machine.
+// Makes `host` this process's machine; null for none. Not to be called while another thread uses
+// the machine.
 void Attach(const AttachedHost* host) noexcept;
 
-// The machine that was attached last; null when there is none.
+// While it lives, its thread uses `host` in place of the process's machine. Nested uses end in
+// reverse order, in the thread that began them.
+class ThreadAttachment {
+ public:
+  explicit ThreadAttachment(const AttachedHost& host) noexcept;
+  ~ThreadAttachment();
+  ThreadAttachment(const ThreadAttachment&) = delete;
+  ThreadAttachment& operator=(const ThreadAttachment&) = delete;
+
+ private:
+  const AttachedHost* before_;
+};
+
+// What this thread uses: its own machine, or else the process's; null when there is neither. Safe
+// in signal handlers.
 const AttachedHost* Attached() noexcept;
 
 }  // namespace StandIn

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <pthread.h>
+#include <signal.h>
 
 #include "bindings/c/failure.h"
 
@@ -23,10 +24,25 @@ class Uncancelled {
   int before_ = PTHREAD_CANCEL_ENABLE;
 };
 
+// Keeps a write beyond the limit of file sizes from ending the caller's process: it fails, and is
+// reported like one on a full disk.
+class FileSizeSignalHeld {
+ public:
+  FileSizeSignalHeld() noexcept;
+  ~FileSizeSignalHeld();
+  FileSizeSignalHeld(const FileSizeSignalHeld&) = delete;
+  FileSizeSignalHeld& operator=(const FileSizeSignalHeld&) = delete;
+
+ private:
+  sigset_t before_{};
+  bool wasPending_ = false;
+};
+
 // Calls `body` and turns what it throws into a status and an error.
 template <typename Body>
 secpolicy_status Guarded(secpolicy_error** error, const Body& body) noexcept {
   const Uncancelled uncancelled;
+  const FileSizeSignalHeld held;
   if (error != nullptr) *error = nullptr;
   try {
     body();

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "secpolicy/secpolicy_c.h"
+#include "tools/policy/policy.h"
 
 struct secpolicy_text {
   explicit secpolicy_text(std::string lines) : value(std::move(lines)) {}
@@ -18,8 +19,8 @@ struct secpolicy_host {
 };
 
 struct secpolicy_policy {
-  std::string host;     // the path of its host
-  std::string source;   // as given; empty for the host's own directory
-  std::string content;  // CBOR of what ToJson makes of a policy
+  std::string host;    // the path of its host
+  std::string source;  // as given; empty for the host's own directory
+  SecPolicyTool::Policy content;
   std::vector<std::string> errors;
 };

@@ -4,15 +4,12 @@
 
 #include "bindings/c/arguments.h"
 #include "bindings/c/barrier.h"
-#include "bindings/c/child.h"
 #include "bindings/c/handles.h"
 #include "host/image/assemble.h"
 #include "host/image/host_directory.h"
 #include "host/module/description_json.h"
 
-using SecPolicyC::Fields;
 using SecPolicyC::Guarded;
-using SecPolicyC::InChild;
 using SecPolicyC::PathOf;
 using SecPolicyC::RequireSet;
 using StandIn::HostDirectory;
@@ -22,10 +19,7 @@ extern "C" {
 secpolicy_status secpolicy_host_create(const char* directory, secpolicy_error** error) {
   return Guarded(error, [&] {
     const std::string path = PathOf(directory, "directory");
-    InChild([&] {
-      HostDirectory::Create(path, StandIn::DefaultDescriptionText());
-      return Fields{};
-    });
+    HostDirectory::Create(path, StandIn::DefaultDescriptionText());
   });
 }
 
@@ -37,10 +31,7 @@ secpolicy_status secpolicy_host_open(const char* directory, secpolicy_host** hos
     const std::string path = PathOf(directory, "directory");
     auto opened = std::make_unique<secpolicy_host>();
     opened->path = std::filesystem::absolute(path).string();
-    InChild([&] {
-      const HostDirectory here(path);
-      return Fields{};
-    });
+    const HostDirectory here(path);
     *host = opened.release();
   });
 }
@@ -48,10 +39,7 @@ secpolicy_status secpolicy_host_open(const char* directory, secpolicy_host** hos
 secpolicy_status secpolicy_host_assemble(const secpolicy_host* host, secpolicy_error** error) {
   return Guarded(error, [&] {
     RequireSet(host, "host");
-    InChild([&] {
-      StandIn::Assemble(HostDirectory(host->path));
-      return Fields{};
-    });
+    StandIn::Assemble(HostDirectory(host->path));
   });
 }
 

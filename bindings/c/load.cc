@@ -1,26 +1,20 @@
 // Loading a policy into a host's kernel.
-#include <syslog.h>
-
 #include <algorithm>
 #include <nlohmann/json.hpp>
 #include <utility>
 
 #include "bindings/c/text.h"
 #include "tools/check/load_errors.h"
-#include "tools/policy/held_policy.h"
-#include "tools/policy/host_work.h"
+#include "tools/policy/batch_load.h"
+#include "tools/policy/library_output.h"
 #include "tools/policy/policy_path.h"
-#include "tools/requests/batch_load.h"
 #include "tools/requests/held_json.h"
 
 using nlohmann::json;
 using SecPolicyC::Failure;
-using SecPolicyC::Fields;
-using SecPolicyTool::HostWork;
-using SecPolicyTool::LoadEnd;
 using SecPolicyTool::PolicyPath;
 using StandIn::HostDirectory;
-using StandIn::Session;
+using StandIn::LoadEnd;
 
 namespace {
 
@@ -44,36 +38,35 @@ json ErrorsJson(const std::vector<std::string>& texts, const PolicyPath& policy)
   return errors;
 }
 
-secpolicy_status StatusOf(const HostWork& outcome) {
-  if (outcome.wasTerminated) return SECPOLICY_LOAD_TERMINATED;
-  return outcome.result.at("isDone").get<bool>() ? SECPOLICY_OK : SECPOLICY_LOAD_FAILED;
+struct LoadResult {
+  secpolicy_status status;
+  const char* name;
+};
+
+LoadResult ResultOf(LoadEnd end) {
+  switch (end) {
+    case LoadEnd::kDone:
+      return {SECPOLICY_OK, "done"};
+    case LoadEnd::kFailed:
+      return {SECPOLICY_LOAD_FAILED, "failed"};
+    case LoadEnd::kTerminated:
+      break;
+  }
+  return {SECPOLICY_LOAD_TERMINATED, "terminated"};
 }
 
-const char* NameOf(secpolicy_status status) {
-  if (status == SECPOLICY_OK) return "done";
-  return status == SECPOLICY_LOAD_FAILED ? "failed" : "terminated";
-}
+// Keeps the errors, and logs what a load logs under the caller's own name.
+class LoggedErrors final : public StandIn::LibraryOutput {
+ public:
+  void OnInfo(const std::string& message) override { SecPolicyTool::LogProgress(message); }
+  void OnError(const std::string& message, const Tavon::Lib::TavonException*) override {
+    texts.push_back(message);
+    SecPolicyTool::LogFailure(message);
+  }
+  void OnPrint(const std::string&) override {}
 
-// In a process of the host's, whose kernel keeps what is installed.
-HostWork LoadInHost(HostDirectory host, const PolicyPath& policy) {
-  // Before the root directory changes: the connection to the system log stays.
-  openlog("secpolicy", LOG_NDELAY, LOG_USER);
-  const StandIn::ImageIndex image = SecPolicyTool::ImageOf(host);
-  StandIn::SessionOptions options;
-  options.visible = policy.visible;
-  LoadEnd end = LoadEnd::kFailed;
-  return SecPolicyTool::WorkInHost(
-      std::move(host), options,
-      [&](Session& session) {
-        SecPolicyTool::RequireDirectory(policy);
-        end = SecPolicyTool::LoadInBatch(session, policy.path);
-      },
-      [&](Session& session) -> json {
-        session.Commit();
-        return {{"isDone", end == LoadEnd::kDone},
-                {"installed", SecPolicyTool::HeldJson(session.Module(), image, std::nullopt)}};
-      });
-}
+  std::vector<std::string> texts;
+};
 
 // The error that stands for all: the first that names a line.
 json ToldOf(const json& errors) {
@@ -84,26 +77,25 @@ json ToldOf(const json& errors) {
   return errors.front();
 }
 
-// What a load gives to the calling process.
-enum Field : std::size_t { kStatus, kText, kMessage, kFile, kLine };
-
-Fields Load(const std::string& hostPath, const std::string& dir) {
-  const PolicyPath policy = SecPolicyTool::LocatePolicy(dir);
-  HostWork outcome = LoadInHost(HostDirectory(hostPath), policy);
-  const secpolicy_status status = StatusOf(outcome);
-  const json errors = ErrorsJson(outcome.errors, policy);
-  const json told = ToldOf(errors);
-  return {std::to_string(status),
-          SecPolicyTool::TextOfJson({{"source", dir},
-                                     {"outcome", NameOf(status)},
-                                     {"errors", errors},
-                                     {"installed", std::move(outcome.result["installed"])}}),
-          told["message"], told.value("file", ""), std::to_string(told.value("line", 0U))};
+Failure LoadFailure(secpolicy_status status, const json& told) {
+  return {status, told["message"], told.value("file", ""), told.value("line", 0U)};
 }
 
-Failure LoadFailure(secpolicy_status status, Fields& loaded) {
-  return {status, std::move(loaded[kMessage]), std::move(loaded[kFile]),
-          static_cast<std::uint32_t>(std::stoul(loaded[kLine]))};
+// Stores the description of what came of the load in `text`. Throws Failure, with the description
+// stored, for a load that was not done without errors.
+void Load(const std::string& hostPath, const std::string& dir, std::string& text) {
+  const PolicyPath policy = SecPolicyTool::LocatePolicy(dir);
+  StandIn::Kernel kernel{HostDirectory(hostPath), {}};
+  SecPolicyTool::RequireDirectory(policy.Files(kernel));
+  LoggedErrors logged;
+  const LoadResult result = ResultOf(SecPolicyTool::LoadInBatch(policy, kernel, logged));
+  kernel.Commit();
+  const json errors = ErrorsJson(logged.texts, policy);
+  text = SecPolicyTool::TextOfJson({{"source", dir},
+                                    {"outcome", result.name},
+                                    {"errors", errors},
+                                    {"installed", SecPolicyTool::HeldJson(kernel, std::nullopt)}});
+  if (result.status != SECPOLICY_OK) throw LoadFailure(result.status, ToldOf(errors));
 }
 
 }  // namespace
@@ -114,11 +106,16 @@ extern "C" secpolicy_status secpolicy_load(const secpolicy_host* host, const cha
   return SecPolicyC::Guarded(error, [&] {
     SecPolicyC::RequireSet(host, "host");
     const std::string dir = SecPolicyC::PolicyDirOf(directory, "directory");
-    Fields loaded = SecPolicyC::InChild([&] { return Load(host->path, dir); });
-    const auto status = static_cast<secpolicy_status>(std::stoi(loaded.at(kStatus)));
-    auto text = std::make_unique<secpolicy_text>(std::move(loaded.at(kText)));
-    Failure failure = LoadFailure(status, loaded);
-    if (result != nullptr) *result = text.release();
-    if (status != SECPOLICY_OK) throw Failure(std::move(failure));
+    auto text = std::make_unique<secpolicy_text>("");
+    const auto hand = [&] {
+      if (result != nullptr) *result = text.release();
+    };
+    try {
+      Load(host->path, dir, text->value);
+    } catch (const Failure&) {
+      hand();
+      throw;
+    }
+    hand();
   });
 }

@@ -5,7 +5,6 @@
 
 #include "bindings/c/text.h"
 #include "host/text/utf8_text.h"
-#include "tools/policy/policy_json.h"
 #include "tools/policy/policy_source.h"
 #include "tools/requests/questions.h"
 #include "tools/requests/search_request.h"
@@ -13,32 +12,16 @@
 using nlohmann::json;
 using SecPolicyC::AnswerWithText;
 using SecPolicyC::Failure;
-using SecPolicyC::Fields;
 using SecPolicyC::OptionalTextOf;
 using SecPolicyC::RequireSet;
 using SecPolicyC::TextOf;
 using SecPolicyC::WordsOf;
 using SecPolicyTool::AskedPolicy;
-using SecPolicyTool::Policy;
 using SecPolicyTool::Question;
 using SecPolicyTool::SearchRequest;
 using StandIn::HostDirectory;
 
 namespace {
-
-// The content first, then the errors.
-Fields ReadPolicy(const std::string& hostPath, const std::string& source) {
-  const SecPolicyTool::SourcePolicy read =
-      SecPolicyTool::ReadSource(HostDirectory(hostPath), source);
-  Fields fields(1);
-  json::to_cbor(SecPolicyTool::ToJson(read.policy), fields[0]);
-  for (const std::string& error : read.errors) fields.push_back(StandIn::ValidText(error));
-  return fields;
-}
-
-Policy ContentOf(const secpolicy_policy& policy) {
-  return SecPolicyTool::PolicyOfJson(json::from_cbor(policy.content));
-}
 
 std::optional<bool> IsGrantedOf(secpolicy_decision decision) {
   switch (decision) {
@@ -76,13 +59,13 @@ SearchRequest RequestOf(const secpolicy_search_terms* terms) {
 }
 
 AskedPolicy Asked(const secpolicy_policy& policy) {
-  return {ContentOf(policy), HostDirectory(policy.host)};
+  return {policy.content, HostDirectory(policy.host)};
 }
 
 json SearchIn(const secpolicy_policy& policy, const SearchRequest& request) {
-  const Policy content = ContentOf(policy);
   const SecPolicyTool::HostPaths paths{HostDirectory(policy.host)};
-  return SecPolicyTool::SearchJson(policy.source, SecPolicyTool::Find(content, request, paths));
+  return SecPolicyTool::SearchJson(policy.source,
+                                   SecPolicyTool::Find(policy.content, request, paths));
 }
 
 json AskMay(const secpolicy_policy& policy, const std::string& domain,
@@ -116,10 +99,12 @@ secpolicy_status secpolicy_policy_read(const secpolicy_host* host, const char* s
     auto read = std::make_unique<secpolicy_policy>();
     read->host = host->path;
     read->source = SecPolicyC::PolicyDirOf(source, "source");
-    Fields fields = SecPolicyC::InChild([&] { return ReadPolicy(read->host, read->source); });
-    read->content = std::move(fields.at(0));
-    fields.erase(fields.begin());
-    read->errors = std::move(fields);
+    SecPolicyTool::SourcePolicy found =
+        SecPolicyTool::ReadSource(HostDirectory(read->host), read->source);
+    read->content = std::move(found.policy);
+    for (const std::string& each : found.errors) {
+      read->errors.push_back(StandIn::ValidText(each));
+    }
     *policy = read.release();
   });
 }

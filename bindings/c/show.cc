@@ -5,8 +5,6 @@
 #include "bindings/c/text.h"
 #include "tools/check/check.h"
 #include "tools/check/report_forms.h"
-#include "tools/policy/held_policy.h"
-#include "tools/policy/host_work.h"
 #include "tools/query/bad_request.h"
 #include "tools/requests/held_json.h"
 
@@ -15,27 +13,16 @@ using SecPolicyC::AnswerWithText;
 using SecPolicyC::PolicyDirOf;
 using SecPolicyC::RequireSet;
 using StandIn::HostDirectory;
-using StandIn::Session;
-using StandIn::SessionOptions;
 
 namespace {
 
 json ShowHeld(const std::string& hostPath, const std::optional<unsigned int>& domain) {
-  HostDirectory host(hostPath);
-  const StandIn::ImageIndex image = SecPolicyTool::ImageOf(host);
-  SessionOptions options;
-  options.kernel = SessionOptions::Kernel::kSnapshot;
-  const auto work = [&](Session& session) -> json {
-    if (domain && !session.Module().GetDomainInfo(*domain)) return nullptr;
-    return SecPolicyTool::HeldJson(session.Module(), image, domain);
-  };
-  json held = SecPolicyTool::WorkInHost(
-                  std::move(host), options, [](Session&) {}, work)
-                  .result;
-  if (held.is_null()) {
+  StandIn::Kernel kernel(HostDirectory(hostPath),
+                         {.state = StandIn::KernelOptions::State::kSnapshot});
+  if (domain && !kernel.Module().GetDomainInfo(*domain)) {
     throw SecPolicyTool::BadRequest("no domain has the id " + std::to_string(*domain));
   }
-  return held;
+  return SecPolicyTool::HeldJson(kernel, domain);
 }
 
 }  // namespace

@@ -4,7 +4,7 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "host/gate/private_call_answers.h"
+#include "host/kernel/private_call_answers.h"
 #include "platform/private_calls.h"
 
 namespace Fuzz {

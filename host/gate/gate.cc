@@ -11,9 +11,10 @@
 
 #include "host/gate/ordinary_call_answers.h"
 #include "host/gate/passthrough.h"
-#include "host/gate/private_call_answers.h"
 #include "host/gate/trap_filter.h"
 #include "host/gate/trapped_call.h"
+#include "host/gate/user_memory.h"
+#include "host/kernel/private_call_answers.h"
 #include "host/trace/thread_occupation.h"
 #include "secpolicy/host/host_error.h"
 
@@ -35,14 +36,11 @@ CallArguments ArgumentsOf(const TrappedCall& call) {
   return arguments;
 }
 
-bool IsPrivate(long number) {
-  return number >= static_cast<long>(PrivateCall::kFirst) &&
-         number <= static_cast<long>(PrivateCall::kLast);
-}
-
 void AnswerPrivate(const AttachedHost* host, TrappedCall& call) {
   if (host == nullptr) return call.SetResult(-ENOSYS);
-  const PrivateAnswer answer = AnswerPrivateCall(*host, call.Number(), ArgumentsOf(call));
+  UserMemory memory;
+  const PrivateAnswer answer =
+      AnswerPrivateCall(*host, call.Number(), ArgumentsOf(call), memory);
   call.SetResult(answer.status);
   call.SetSecondResult(answer.error);
 }
@@ -62,7 +60,7 @@ long AnswerOrdinary(const AttachedHost* host, long number, const CallArguments& 
 }
 
 void Answer(const AttachedHost* host, TrappedCall& call) {
-  if (IsPrivate(call.Number())) return AnswerPrivate(host, call);
+  if (IsPrivateCall(call.Number())) return AnswerPrivate(host, call);
   call.SetResult(AnswerOrdinary(host, call.Number(), ArgumentsOf(call)));
 }
 
@@ -70,7 +68,7 @@ void Answer(const AttachedHost* host, TrappedCall& call) {
 // the lock, and the allocator may have been interrupted: so nothing is done but to refuse.
 void AnswerInterrupting(const AttachedHost* host, TrappedCall& call) {
   const CallArguments arguments = ArgumentsOf(call);
-  if (IsPrivate(call.Number())) {
+  if (IsPrivateCall(call.Number())) {
     const PrivateAnswer answer = Refusal(EDEADLK);
     call.SetResult(answer.status);
     call.SetSecondResult(answer.error);

@@ -4,87 +4,43 @@
 #include <sys/syscall.h>
 #include <sys/xattr.h>
 
-#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
 #include <cstring>
 #include <memory>
-#include <new>
 #include <optional>
 #include <string>
 
 #include "host/gate/passthrough.h"
 #include "host/gate/user_memory.h"
-#include "host/module/module_error.h"
+#include "host/kernel/file_calls.h"
 #include "platform/private_calls.h"
-#include "platform/tavon_strcat.h"
 
 namespace StandIn {
 
-using Tavon::Misc::StrCat;
-
 namespace {
 
-// Runs `answer`; what it throws becomes a negative errno.
-template <typename Answer>
-long AsResult(const Answer& answer) noexcept try {
-  return answer();
-} catch (const ModuleError& refusal) {
-  return refusal.Number() != 0 ? -refusal.Number() : -EIO;
-} catch (const BadArgument& argument) {
-  return -argument.number;
-} catch (const std::bad_alloc&) {
-  return -ENOMEM;
-} catch (...) {
-  return -EIO;
-}
-
-[[noreturn]] void RefuseToResolve(const std::string& path, int number) {
-  throw ModuleError(number, StrCat("\"", path, "\" cannot be resolved: ", std::strerror(number)));
-}
-
-std::string RealPath(const std::string& path) {
-  const std::unique_ptr<char, decltype(&std::free)> found(realpath(path.c_str(), nullptr),
-                                                          &std::free);
-  if (!found) RefuseToResolve(path, errno);
-  std::string resolved = found.get();
-  if (resolved.size() >= ZekCtl::Kernel::kPathBytes) RefuseToResolve(path, ENAMETOOLONG);
-  return resolved;
-}
+// The files of this process, whose root directory is the host's.
+class ProcessFiles final : public CallerFiles {
+ public:
+  [[nodiscard]] std::optional<std::string> Resolve(const std::string& path) const override {
+    return FileTree::Machine().Resolve(path);
+  }
+  [[nodiscard]] bool Status(const std::string& path, struct stat& status) const override {
+    return stat(path.c_str(), &status) == 0;
+  }
+};
 
 // Whether the caller means the label's attribute. A name that cannot be read is left to the kernel
 // to refuse.
-bool NamesLabel(const MemoryAhead& memory, std::uint64_t name) {
+bool NamesLabel(const UserMemory& memory, std::uint64_t name) {
   try {
     return memory.String(name, XATTR_NAME_MAX + 1) == ZekCtl::Kernel::kLabelAttribute;
   } catch (const BadArgument&) {
     return false;
   }
-}
-
-// Whether `path`, which holds no links, is one of the directories made visible, or below one.
-bool IsMadeVisible(const AttachedHost& host, const std::string& path) {
-  return std::any_of(host.visible.begin(), host.visible.end(), [&](const std::string& dir) {
-    return path == dir || path.starts_with(dir + "/");
-  });
-}
-
-// The path under which the label of the file that the caller names is kept; nothing for a file that
-// carries none. Beside the files of the image, what is made visible carries one, since on a machine
-// of its own it would lie in the same file system; and so do directories that no archive brought,
-// since the host itself makes such for what is to be visible.
-std::optional<std::string> LabelledPath(const AttachedHost& host, const MemoryAhead& memory,
-                                        std::uint64_t address) {
-  const std::string path = memory.String(address, PATH_MAX);
-  struct stat status {};
-  if (stat(path.c_str(), &status) != 0) throw BadArgument{errno};
-  auto inImage = host.files.PathOf(status.st_dev, status.st_ino);
-  if (inImage) return inImage;
-  std::string resolved = RealPath(path);
-  if (S_ISDIR(status.st_mode) || IsMadeVisible(host, resolved)) return resolved;
-  return std::nullopt;
 }
 
 // A file that carries the label does so from the start, every other file never.
@@ -107,11 +63,11 @@ bool ConcernsModule(long number, const CallArguments& arguments) noexcept {
 }
 
 long AnswerResolvePath(const AttachedHost& host, const CallArguments& arguments) noexcept {
-  return AsResult([&]() -> long {
-    std::string path = ReadString(arguments[1], ZekCtl::Kernel::kPathBytes);
-    const std::string resolved = host.point.Pass(
-        Operation::kResolvePath, [&] { return path; }, [&] { return RealPath(path); });
-    WriteMemory(arguments[2], resolved.c_str(), resolved.size() + 1);
+  return AsCallResult([&]() -> long {
+    UserMemory memory;
+    const std::string path = memory.String(arguments[1], ZekCtl::Kernel::kPathBytes);
+    const std::string resolved = ResolvedPath(host, ProcessFiles(), path);
+    memory.Write(arguments[2], resolved.c_str(), resolved.size() + 1);
     return 0;
   });
 }
@@ -122,13 +78,14 @@ long AnswerSetAttribute(const AttachedHost& host, const CallArguments& arguments
   const std::uint64_t value = arguments[2];
   const std::uint64_t size = arguments[3];
   const std::uint64_t flags = arguments[4];
-  return AsResult([&]() -> long {
+  return AsCallResult([&]() -> long {
     LabelId label = 0;
-    const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}, {value, sizeof label}});
+    UserMemory memory;
+    memory.Expect({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}, {value, sizeof label}});
     if (!NamesLabel(memory, name)) {
       return SecpolicyGatePassThrough(SYS_setxattr, arguments.data());
     }
-    const auto labelledPath = LabelledPath(host, memory, path);
+    const auto labelledPath = LabelledPath(host, ProcessFiles(), memory.String(path, PATH_MAX));
     CheckFlags(flags, labelledPath.has_value());
     if (size != sizeof label) throw BadArgument{EINVAL};
     memory.Read(value, &label, sizeof label);
@@ -142,15 +99,16 @@ long AnswerGetAttribute(const AttachedHost& host, const CallArguments& arguments
   const std::uint64_t name = arguments[1];
   const std::uint64_t value = arguments[2];
   const std::uint64_t size = arguments[3];
-  return AsResult([&]() -> long {
-    const MemoryAhead memory({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}});
+  return AsCallResult([&]() -> long {
+    UserMemory memory;
+    memory.Expect({{name, XATTR_NAME_MAX + 1}, {path, PATH_MAX}});
     if (!NamesLabel(memory, name)) return SecpolicyGatePassThrough(SYS_getxattr, arguments.data());
-    const auto labelledPath = LabelledPath(host, memory, path);
+    const auto labelledPath = LabelledPath(host, ProcessFiles(), memory.String(path, PATH_MAX));
     if (!labelledPath) throw BadArgument{ENODATA};
     const LabelId label = host.module.FileLabel(*labelledPath);
     if (size == 0) return sizeof label;
     if (size < sizeof label) throw BadArgument{ERANGE};
-    WriteMemory(value, &label, sizeof label);
+    memory.Write(value, &label, sizeof label);
     return sizeof label;
   });
 }

@@ -1,7 +1,7 @@
 // What the kernel answers to ordinary system calls that concern the security module.
 #pragma once
 
-#include "host/gate/private_call_answers.h"
+#include "host/kernel/private_call_answers.h"
 
 namespace StandIn {
 

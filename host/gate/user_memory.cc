@@ -32,28 +32,20 @@ void CopyMemory(Copy copy, std::uint64_t address, void* here, std::size_t size) 
 
 }  // namespace
 
-void ReadMemory(std::uint64_t address, void* to, std::size_t size) {
-  CopyMemory(process_vm_readv, address, to, size);
-}
-
 bool TryReadMemory(std::uint64_t address, void* to, std::size_t size) noexcept {
   return CopiesMemory(process_vm_readv, address, to, size);
 }
 
-void WriteMemory(std::uint64_t address, const void* from, std::size_t size) {
+void UserMemory::Write(std::uint64_t address, const void* from, std::size_t size) const {
   CopyMemory(process_vm_writev, address, const_cast<void*>(from), size);
 }
 
-void ProbeWritable(std::uint64_t address, std::size_t size) {
+void UserMemory::RequireWritable(std::uint64_t address, std::size_t size) const {
   // Written over with what it holds.
   CopyMemory(process_vm_writev, address, reinterpret_cast<void*>(address), size);
 }
 
-std::string ReadString(std::uint64_t address, std::size_t room) {
-  return MemoryAhead({}).String(address, room);
-}
-
-MemoryAhead::MemoryAhead(std::initializer_list<Piece> pieces) {
+void UserMemory::Expect(std::initializer_list<Piece> pieces) {
   std::array<iovec, kPieces> here;
   std::array<iovec, kPieces> there;
   std::size_t count = 0;
@@ -67,6 +59,8 @@ MemoryAhead::MemoryAhead(std::initializer_list<Piece> pieces) {
   }
   const ssize_t result =
       count == 0 ? 0 : process_vm_readv(getpid(), here.data(), count, there.data(), count, 0);
+  // Those announced before are gone.
+  for (std::size_t i = count; i < kPieces; ++i) copies_[i].size = 0;
   // It ends at the first piece that cannot be read; none is read in part, since none goes beyond
   // its page.
   std::size_t copied = result < 0 ? 0 : static_cast<std::size_t>(result);
@@ -77,20 +71,22 @@ MemoryAhead::MemoryAhead(std::initializer_list<Piece> pieces) {
   }
 }
 
-std::string_view MemoryAhead::At(std::uint64_t address) const {
+std::string_view UserMemory::At(std::uint64_t address) const {
   for (const Copy& copy : copies_) {
     if (address == copy.address) return {copy.bytes.data(), copy.size};
   }
   return {};
 }
 
-void MemoryAhead::Read(std::uint64_t address, void* to, std::size_t size) const {
+void UserMemory::Read(std::uint64_t address, void* to, std::size_t size) const {
   const std::string_view copied = At(address);
-  if (copied.size() < size) return ReadMemory(address, to, size);
+  if (copied.size() < size) {
+    return CopyMemory(process_vm_readv, address, to, size);
+  }
   copied.copy(static_cast<char*>(to), size);
 }
 
-std::string MemoryAhead::String(std::uint64_t address, std::size_t room) const {
+std::string UserMemory::String(std::uint64_t address, std::size_t room) const {
   std::string text;
   text.reserve(room);  // memory runs out here or nowhere, wherever the string lies in its pages
   std::array<char, kChunk> chunk;
@@ -103,7 +99,7 @@ std::string MemoryAhead::String(std::uint64_t address, std::size_t room) const {
     // Up to the end of a page at most: the string may end just before memory that cannot be read.
     const std::uint64_t from = address + text.size();
     const std::size_t size = std::min({chunk.size(), BytesToPageEnd(from), room - text.size()});
-    ReadMemory(from, chunk.data(), size);
+    CopyMemory(process_vm_readv, from, chunk.data(), size);
     next = {chunk.data(), size};
   }
 }

@@ -1,51 +1,29 @@
-// The caller's memory, as a kernel sees it.
+// The memory of any caller of this process, as a kernel sees it.
 #pragma once
 
 #include <array>
-#include <cstddef>
-#include <cstdint>
-#include <initializer_list>
-#include <string>
 #include <string_view>
+
+#include "host/kernel/caller_memory.h"
 
 namespace StandIn {
 
-// An argument that cannot be used: thrown with the errno that a kernel would answer.
-struct BadArgument {
-  int number;
-};
-
-// Access to addresses that a caller handed over and that may be anything. All throw BadArgument
-// EFAULT for memory that cannot be read or written; nothing crashes.
-
-void ReadMemory(std::uint64_t address, void* to, std::size_t size);
-void WriteMemory(std::uint64_t address, const void* from, std::size_t size);
-
-// Whether the memory could be read, all of it. Safe in signal handlers.
-bool TryReadMemory(std::uint64_t address, void* to, std::size_t size) noexcept;
-
-// Makes sure that the memory can be written, without changing it.
-void ProbeWritable(std::uint64_t address, std::size_t size);
-
-// The NUL-terminated string there, without its NUL. BadArgument ENAMETOOLONG when it and its NUL
-// take more than `room` bytes.
-std::string ReadString(std::uint64_t address, std::size_t room);
-
-// What an answer is about to read, for one system call in place of one for each piece. Its
-// functions do what those above do; what could not be copied beforehand, since it cannot be read or
-// is longer than most, they read when they are asked for it. So errors come where they would.
-class MemoryAhead {
+// Addresses may be anything; nothing crashes. Copies through the kernel, which checks every
+// address.
+//
+// What Expect announces is fetched with one system call in place of one for each piece; what cannot
+// be copied beforehand, since it cannot be read or is longer than most, is read when it is asked
+// for. So errors come where they would.
+class UserMemory final : public CallerMemory {
  public:
-  struct Piece {
-    std::uint64_t address;
-    std::size_t size;  // at most; what lies behind the end of its page is left for later
-  };
+  UserMemory() = default;
 
-  // At most kPieces of them, in the order in which they will be read.
-  explicit MemoryAhead(std::initializer_list<Piece> pieces);
-
-  void Read(std::uint64_t address, void* to, std::size_t size) const;
-  [[nodiscard]] std::string String(std::uint64_t address, std::size_t room) const;
+  void Read(std::uint64_t address, void* to, std::size_t size) const override;
+  void Write(std::uint64_t address, const void* from, std::size_t size) const override;
+  void RequireWritable(std::uint64_t address, std::size_t size) const override;
+  [[nodiscard]] std::string String(std::uint64_t address, std::size_t room) const override;
+  // At most kPieces, in the order in which they will be read; in place of those announced before.
+  void Expect(std::initializer_list<Piece> pieces) override;
 
  private:
   static constexpr std::size_t kPieces = 3;
@@ -62,5 +40,8 @@ class MemoryAhead {
 
   std::array<Copy, kPieces> copies_;
 };
+
+// Whether the memory could be read, all of it. Safe in signal handlers.
+bool TryReadMemory(std::uint64_t address, void* to, std::size_t size) noexcept;
 
 }  // namespace StandIn

@@ -6,10 +6,10 @@
 
 namespace StandIn {
 
-// Reads /proc through a descriptor, so that it still can after a change of the root directory.
+// Reads /proc through a descriptor, so that it still can after a change of the root directory. Where
+// there is no /proc, start times are unknown, and a process is told by its id alone.
 class ProcProcesses final : public ProcessTable {
  public:
-  // Throws HostError when /proc cannot be opened.
   ProcProcesses();
 
   ProcessIdentity Self() const override;

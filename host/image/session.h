@@ -1,29 +1,18 @@
 // The use of a host by this process.
 #pragma once
 
-#include <optional>
 #include <string>
 #include <vector>
 
-#include "host/attached_host.h"
-#include "host/image/host_directory.h"
-#include "host/image/proc_processes.h"
-#include "host/image/root_index.h"
-#include "host/image/state_file.h"
-#include "host/image/state_keeper.h"
-#include "host/module/simulated_module.h"
-#include "host/trace/fault_plan.h"
-#include "host/trace/observed_module.h"
-#include "host/trace/trace_log.h"
-#include "secpolicy/host/entered_host.h"
+#include "host/kernel/kernel.h"
 
 namespace StandIn {
 
 struct SessionOptions {
   // Directories outside the host that are to be found inside under the same absolute paths.
   std::vector<std::string> visible;
-  TraceLog::Sink trace;
-  std::vector<Fault> faults;
+  TraceLog::Sink trace = nullptr;
+  std::vector<Fault> faults = {};
   using Kernel = EnterOptions::Kernel;
   Kernel kernel = Kernel::kKept;
 };
@@ -32,9 +21,6 @@ struct SessionOptions {
 // the host's security module, and the platform's libraries answer for both. That cannot be undone:
 // enter a host in a process made for it, which starts no other program (see host/gate/gate.h). One
 // session a process.
-//
-// Each operation on the module is kept before it reports success (see state_keeper.h), unless a
-// batch keeps many at once, or the kernel is the process's own.
 class Session {
  public:
   // Throws HostError when the host is damaged, has not been assembled, or cannot be entered here.
@@ -43,28 +29,15 @@ class Session {
   Session(const Session&) = delete;
   Session& operator=(const Session&) = delete;
 
-  // From here to Commit, operations are kept together; see StateKeeper. A process that ends without
-  // Commit loses what the batch did. Nothing is done where nothing is kept.
-  void BeginBatch() {
-    if (isKept_) keeper_.BeginBatch();
-  }
-  void Commit() { keeper_.Commit(); }
+  // See Kernel. A process that ends without Commit loses what the batch did.
+  void BeginBatch() { kernel_.BeginBatch(); }
+  void Commit() { kernel_.Commit(); }
 
   // The module behind all hooks, as the platform's libraries use it.
-  [[nodiscard]] SecurityModule& Module() { return observed_; }
+  [[nodiscard]] SecurityModule& Module() { return kernel_.Module(); }
 
  private:
-  HostDirectory host_;
-  bool isKept_;
-  ProcProcesses processes_;
-  SimulatedModule module_;
-  StateFile file_;
-  StateKeeper keeper_;
-  TraceLog trace_;
-  FaultPlan faults_;
-  OperationPoint point_;
-  ObservedModule observed_;
-  RootIndex files_;
+  Kernel kernel_;
   AttachedHost attached_;
 };
 

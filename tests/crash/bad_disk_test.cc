@@ -101,21 +101,7 @@ TEST_F(BadDiskTest, ReadOnlyDisk) {
 }
 
 TEST_F(BadDiskTest, FileSizeLimit) {
-  const Result load = LoadAfter([] {
-    signal(SIGXFSZ, SIG_IGN);
-    LimitFileSize();
-  });
-  ExpectRefused(load, Host() + "/kernel.json: cannot be written: File too large");
-  ExpectUsable();
-}
-
-TEST_F(BadDiskTest, FileSizeLimitThatKills) {
-  const Result load = LoadAfter(LimitFileSize);
-  EXPECT_EQ(load.status, 1);
-  EXPECT_THAT(load.err, EndsWith("Error: the load was killed (File size limit exceeded); the "
-                                 "kernel holds what it held before\n"));
-  EXPECT_EQ(State(), OldState());
-  EXPECT_THAT(LeftOver(), testing::ElementsAre("kernel.json.new"));
+  ExpectRefused(LoadAfter(LimitFileSize), Host() + "/kernel.json: cannot be written: File too large");
   ExpectUsable();
 }
 

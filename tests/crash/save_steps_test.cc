@@ -64,25 +64,5 @@ TEST_F(SaveStepsTest, KilledBeforeEachCallUntilTheLockIsGivenUp) {
   EXPECT_TRUE(isRenamed);
 }
 
-// The command outlives the process that loads, and says what became of it.
-TEST_F(SaveStepsTest, CommandWhoseLoadIsKilledSaysWhatTheKernelHolds) {
-  const auto errorWhenKilledAt = [&](const std::string& name) {
-    SaveCalls load = StartedLoad();
-    auto call = load.Next();
-    while (call && NameOf(*call) != name) call = load.Next();
-    load.KillWaiting();
-    load.Finish();
-    EXPECT_EQ(load.ExitStatus(), 1) << name;
-    return LoadErrors();
-  };
-  EXPECT_THAT(errorWhenKilledAt("rename"), EndsWith("Error: the load was killed (Killed); the "
-                                                    "kernel holds what it held before\n"));
-  EXPECT_TRUE(State() == OldState());
-  EXPECT_THAT(errorWhenKilledAt("exit"),
-              EndsWith("Error: the load was killed (Killed); the kernel's state has been written "
-                       "since it began, see \"secpolicy show\"\n"));
-  EXPECT_TRUE(State() == NewState());
-}
-
 }  // namespace
 }  // namespace CrashTest

@@ -7,6 +7,7 @@
 namespace SecPolicyTool {
 namespace {
 
+using testing::ContainsRegex;
 using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::StartsWith;
@@ -166,7 +167,7 @@ TEST_F(DeepTreeTest, LimitOfOpenFilesIsNamedWhereItEndsTheLabelling) {
   const Result result = WithFewFiles({"label", "set", "--host", Host(), "-R", "/deep", "conf"});
   EXPECT_EQ(result.status, 1);
   EXPECT_THAT(result.Errors(),
-              ElementsAre(StartsWith("Error: Unable to open directory /deep/d/d/d/"),
+              ElementsAre(ContainsRegex("^Error: Unable to .* /deep/d/d/d/"),
                           std::string("Error: ") + kTooManyOpenFiles));
 }
 
@@ -177,9 +178,9 @@ TEST_F(DeepTreeTest, LimitOfOpenFilesIsNamedOnceByALoad) {
   std::vector<std::string> errors = result.Errors();
   std::erase_if(errors, [](const std::string& line) { return !line.starts_with("Error: "); });
   ASSERT_GE(errors.size(), 3U);
-  EXPECT_THAT(errors[0], HasSubstr("/fileLabels/base:1 : Unable to open directory /deep/d/"));
+  EXPECT_THAT(errors[0], ContainsRegex("/fileLabels/base:1 : Unable to .* /deep/d/d/d/"));
   EXPECT_EQ(errors[1], std::string("Error: ") + kTooManyOpenFiles);
-  EXPECT_THAT(errors[2], HasSubstr("/fileLabels/base:2 : Unable to open directory /deep/d/"));
+  EXPECT_THAT(errors[2], ContainsRegex("/fileLabels/base:2 : Unable to .* /deep/d/d/d/"));
   EXPECT_EQ(std::count(errors.begin(), errors.end(), errors[1]), 1);
 }
 

@@ -1,27 +1,20 @@
 #include "tools/check/check.h"
 
-#include <filesystem>
-#include <nlohmann/json.hpp>
 #include <utility>
 
+#include "host/doors/library_use.h"
 #include "platform/tavon_strcat.h"
 #include "tools/check/domain_lines.h"
-#include "tools/check/error_capture.h"
-#include "tools/check/findings_json.h"
 #include "tools/check/label_lines.h"
 #include "tools/check/object_lines.h"
 #include "tools/check/references.h"
 #include "tools/check/tardisk_lines.h"
-#include "tools/policy/held_policy.h"
-#include "tools/policy/host_work.h"
+#include "tools/policy/library_output.h"
 #include "tools/policy/policy_path.h"
-#include "tools/policy/trial_load.h"
 
 namespace SecPolicyTool {
 
-using nlohmann::json;
 using StandIn::HostDirectory;
-using StandIn::Session;
 
 std::string AtLine(const std::string& path, unsigned int line, const std::string& cause) {
   return Tavon::Misc::StrCat(path, ":", line, " : ", cause);
@@ -30,7 +23,7 @@ std::string AtLine(const std::string& path, unsigned int line, const std::string
 namespace {
 
 DirectoryToRead Below(const PolicyFiles& policy, const char* name) {
-  return {policy.path + "/" + name, policy.shown + "/" + name, false};
+  return {policy.tree, policy.path + "/" + name, policy.shown + "/" + name, false};
 }
 
 struct CheckedPolicy {
@@ -45,41 +38,43 @@ struct CheckedPolicy {
   }
 };
 
-bool Exists(const std::string& path) {
-  std::error_code ignored;
-  return std::filesystem::exists(path, ignored);
+// Whether both are the same directory: the host's own, and not one of that path elsewhere.
+bool IsHostsOwn(const DirectoryToRead& directory, const StandIn::FileTree& root) {
+  return directory.path == kTardiskPolicyDir && &directory.tree == &root;
 }
 
-CheckedPolicy ReadAll(const PolicyFiles& place, Findings& findings) {
+CheckedPolicy ReadAll(const PolicyFiles& place, const StandIn::FileTree& root, Findings& findings) {
   CheckedPolicy policy;
   policy.objects = ReadDirectory(Below(place, "objects"), findings);
   policy.domains = ReadDirectory(Below(place, "domains"), findings);
   policy.fileLabels = ReadDirectory(Below(place, "fileLabels"), findings);
-  if (Exists(kTardiskPolicyDir)) {
-    policy.tardisks = ReadDirectory({kTardiskPolicyDir, kTardiskPolicyDir, true}, findings);
+  if (root.Exists(kTardiskPolicyDir)) {
+    policy.tardisks = ReadDirectory({root, kTardiskPolicyDir, kTardiskPolicyDir, true}, findings);
   }
   const DirectoryToRead own = Below(place, "tardisks");
-  if (own.path != kTardiskPolicyDir && Exists(own.path)) {
+  if (!IsHostsOwn(own, root) && own.tree.Exists(own.path)) {
     findings.AddWarning(Kind::kSkippedEntry, SpotOf(own.shown),
                         std::string("a load reads tardisk policy from the host's own ") +
                             kTardiskPolicyDir + ", and not from here",
                         "its lines are checked all the same; pack the files into their tardisks");
     policy.otherTardisks = ReadDirectory(own, findings);
   }
-  CheckTopEntries(place.path, place.shown, findings);
+  CheckTopEntries(place, findings);
   return policy;
 }
 
-// In the host, after the load.
-json CheckAfter(const std::vector<std::string>& errors, const PolicyFiles& place,
-                const StandIn::ImageIndex& image, StandIn::SecurityModule& module) {
+// After the load, in the same use of the library.
+CheckReport CheckAfter(StandIn::LoadEnd end, ErrorList& errors, const PolicyFiles& place,
+                       StandIn::Kernel& kernel) {
   Findings findings;
-  const CheckedPolicy policy = ReadAll(place, findings);
-  const LoadErrors load(errors);
+  StandIn::SecurityModule& module = kernel.Module();
+  const CheckedPolicy policy = ReadAll(place, kernel.Files().Tree(), findings);
+  // What the check itself has the library try reports nothing.
+  const LoadErrors load(std::exchange(errors.Errors(), {}));
   WordJudge judge(module);
   References references;
-  const bool isTerminated = load.IsTerminated();
-  CheckContext context{module, image, load, isTerminated, judge, findings, references};
+  CheckContext context{module, kernel.Files(), load, errors.Shortages(), end == StandIn::LoadEnd::kTerminated,
+                       judge,  findings,       references};
   references.objects.insert(module.Tardisk(StandIn::TardiskWord::kDefaultLabel));
   CheckDomainNames(policy.domains, context);
   for (const CheckedFile& file : policy.domains.files) CheckDomainFile(file, context);
@@ -91,31 +86,20 @@ json CheckAfter(const std::vector<std::string>& errors, const PolicyFiles& place
   load.AddUnexplained(policy.All(), findings);
   std::size_t files = 0;
   for (const CheckedDirectory* directory : policy.All()) files += directory->files.size();
-  return {files, ToJson(std::move(findings).Sorted())};
+  return {std::move(findings).Sorted(), files};
 }
 
 }  // namespace
 
 CheckReport CheckWholePolicy(HostDirectory host, const std::string& dir) {
   const PolicyPath location = LocatePolicy(dir);
-  const PolicyFiles place = location.Files();
-  const StandIn::ImageIndex image = ImageOf(host);
-  ErrorCapture errors;
-  const auto load = [&](Session&) {
-    errors.Begin();
-    try {
-      LoadOnTrial(location);
-    } catch (...) {
-      errors.End();
-      throw;
-    }
-  };
-  HostWork outcome =
-      WorkInHost(std::move(host), TrialOptions(location), load, [&](Session& session) {
-        errors.End();
-        return CheckAfter(errors.Errors(), place, image, session.Module());
-      });
-  return {FindingsOfJson(outcome.result.at(1)), outcome.result.at(0)};
+  StandIn::Kernel kernel(std::move(host), {.state = StandIn::KernelOptions::State::kScratch});
+  const PolicyFiles place = location.Files(kernel);
+  RequireDirectory(place);
+  ErrorList errors;
+  const StandIn::LibraryUse use(kernel, errors, location.MachinePath());
+  const StandIn::LoadEnd end = StandIn::RunLoad(location.path);
+  return CheckAfter(end, errors, place, kernel);
 }
 
 std::vector<Finding> CheckPolicy(HostDirectory host, const std::string& dir) {

@@ -7,7 +7,7 @@
 #include <unordered_map>
 #include <unordered_set>
 
-#include "host/image/image_index.h"
+#include "host/image/root_index.h"
 #include "host/module/security_module.h"
 #include "platform/tavon_exception.h"
 #include "tools/check/findings.h"
@@ -26,8 +26,9 @@ struct References {
 
 struct CheckContext {
   StandIn::SecurityModule& module;  // as the load on trial left it
-  const StandIn::ImageIndex& image;
+  const StandIn::RootIndex& root;   // the host's files
   const LoadErrors& load;
+  const std::set<std::string>& shortages;  // errors of the load for want of descriptors
   bool isTerminated;  // the load, before it came to tardisks and file labels
   WordJudge& judge;
   Findings& findings;

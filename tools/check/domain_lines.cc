@@ -1,9 +1,7 @@
 #include "tools/check/domain_lines.h"
 
 #include <cerrno>
-#include <cstdlib>
 #include <cstring>
-#include <memory>
 
 #include "secpolicy/secpolicy.h"
 #include "tools/check/permission_words.h"
@@ -146,8 +144,7 @@ void DomainFile::CheckPathRule(const PolicyLine& line) {
 // The path as the kernel resolves it, or as written when it cannot; empty when it is refused.
 std::string DomainFile::CheckPath(const PolicyLine& line) {
   const LineWord& word = line.words[1];
-  const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(word.text.c_str(), nullptr),
-                                                             &std::free);
+  const auto resolved = context_.root.Tree().Resolve(word.text);
   const std::string reason = resolved ? "" : std::strerror(errno);
   const bool isAbsolute = word.text.starts_with('/');
   if (!resolved && !isAbsolute) {
@@ -172,7 +169,7 @@ std::string DomainFile::CheckPath(const PolicyLine& line) {
         "the path leads from the loading process's own directory, wherever that is",
         "write the path from the root on");
   }
-  return resolved.get();
+  return *resolved;
 }
 
 }  // namespace

@@ -3,9 +3,9 @@
 #include <array>
 #include <cerrno>
 #include <cstring>
-#include <filesystem>
 #include <string_view>
 
+#include "host/doors/library_use.h"
 #include "secpolicy/secpolicy.h"
 #include "tools/check/label_mappings.h"
 #include "tools/labels/descriptor_limit.h"
@@ -13,8 +13,6 @@
 namespace SecPolicyTool {
 
 namespace {
-
-namespace fs = std::filesystem;
 
 constexpr std::string_view kTree = "/*";
 
@@ -41,11 +39,11 @@ const Trouble& TroubleOf(const std::string& path, std::string_view cause) {
   return kOther;
 }
 
-std::string WithoutLinks(const std::string& path) {
-  std::error_code error;
-  const fs::path resolved = fs::canonical(path.empty() ? "/" : path, error);
-  if (error) return path;
-  return resolved == "/" ? std::string() : resolved.string();
+// The path without links, and without a slash where it is the root alone: it is put in front of
+// names.
+std::string ResolvedAbove(const StandIn::FileTree& root, const std::string& path) {
+  const std::string resolved = root.ResolvedOrSame(path.empty() ? "/" : path);
+  return resolved == "/" ? std::string() : resolved;
 }
 
 class LabelFile {
@@ -60,7 +58,7 @@ class LabelFile {
       const std::string path = word.substr(0, word.size() - (isTree ? kTree.size() : 0));
       if (!Applies(line, path, isTree)) continue;
       if (!path.starts_with('/')) AddRelative(line);
-      mappings.push_back({&file_, &line, WithoutLinks(path), isTree});
+      mappings.push_back({&file_, &line, ResolvedAbove(context_.root.Tree(), path), isTree});
     }
   }
 
@@ -128,17 +126,19 @@ std::string LabelFile::Apply(const PolicyLine& line, const std::string& path, bo
 
 bool LabelFile::Applies(const PolicyLine& line, const std::string& path, bool isTree) {
   std::string cause;
+  bool isShortage = false;
   if (isRefused_ || context_.isTerminated) {
     cause = Apply(line, path, isTree);
+    isShortage = StandIn::LibraryUse::Current()->TakeDescriptorShortage();
   } else if (const LoadError* error = context_.load.At(file_.path, line.number)) {
     cause = error->cause;
+    isShortage = context_.shortages.contains(error->text);
   }
   if (cause.empty()) return true;
   const Trouble& trouble = TroubleOf(line.words[0].text, cause);
-  const std::string reason = DescriptorLimitReason(cause, OpensDirectory);
   context_.findings.AddError(trouble.kind, SpotOf(file_, line, line.words[0]), cause,
                              AtLine(file_.path, line.number, cause),
-                             reason.empty() ? trouble.help : reason);
+                             isShortage ? DescriptorLimitReason() : trouble.help);
   return false;
 }
 

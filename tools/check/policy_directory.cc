@@ -1,14 +1,16 @@
 #include "tools/check/policy_directory.h"
 
+#include <sys/stat.h>
+
 #include <algorithm>
 #include <array>
-#include <filesystem>
-#include <map>
+#include <optional>
 #include <stdexcept>
 #include <string_view>
+#include <utility>
 
+#include "core/directory_stream.h"
 #include "host/module/nearest_word.h"
-#include "secpolicy/secpolicy.h"
 #include "tools/check/file_oddities.h"
 #include "tools/check/findings.h"
 
@@ -16,25 +18,11 @@ namespace SecPolicyTool {
 
 namespace {
 
-namespace fs = std::filesystem;
-
-// All names, in the order in which the directory lists them. None when it cannot be listed.
-std::vector<std::string> NamesIn(const std::string& path) {
-  std::vector<std::string> names;
-  std::error_code error;
-  for (fs::directory_iterator entry(path, error), end; !error && entry != end;
-       entry.increment(error)) {
-    names.push_back(entry->path().filename().string());
-  }
-  return names;
-}
-
-const char* NameOfType(const std::string& path) {
-  std::error_code ignored;
-  switch (fs::symlink_status(path, ignored).type()) {
-    case fs::file_type::symlink:
+const char* NameOfType(mode_t type) {
+  switch (type) {
+    case S_IFLNK:
       return "a symbolic link";
-    case fs::file_type::directory:
+    case S_IFDIR:
       return "a directory";
     default:
       return "no regular file";
@@ -44,7 +32,8 @@ const char* NameOfType(const std::string& path) {
 void AddSkipped(const DirectoryToRead& directory, const std::string& name, Findings& findings) {
   const Spot spot = SpotOf(directory.shown + "/" + name);
   const std::string message =
-      std::string(NameOfType(directory.path + "/" + name)) + ", which a load passes over";
+      std::string(NameOfType(directory.tree.LinkType(directory.path + "/" + name))) +
+      ", which a load passes over";
   const std::string help = "put the file itself here, or remove the entry";
   if (directory.isTardiskPolicy) {
     findings.AddError(Kind::kSkippedEntry, spot, message, "Skipping directory " + name, help);
@@ -59,18 +48,34 @@ void AddBackup(const std::string& shown, Findings& findings) {
                       "remove it");
 }
 
-// The regular files, by name unless the directory's own order counts.
-std::vector<std::string> FilesToRead(const DirectoryToRead& directory, Findings& findings) {
-  std::map<std::string, std::string> files;
-  SecPolicy::GetFileList(directory.path, files);
-  std::vector<std::string> names = NamesIn(directory.path);
-  if (!directory.isTardiskPolicy) std::sort(names.begin(), names.end());
-  std::erase_if(names, [&](const std::string& name) {
-    if (files.contains(directory.path + "/" + name)) return false;
-    AddSkipped(directory, name, findings);
-    return true;
-  });
+// The regular files, by name unless the directory's own order counts. Nothing when the directory
+// cannot be opened.
+std::optional<std::vector<std::string>> FilesToRead(const DirectoryToRead& directory,
+                                                    Findings& findings) {
+  SecPolicy::DirectoryStream stream(directory.tree.OpenDirectory(directory.path));
+  if (!stream.IsOpen()) return std::nullopt;
+  std::vector<SecPolicy::DirectoryEntry> entries;
+  while (auto entry = stream.Next()) entries.push_back(std::move(*entry));
+  if (!directory.isTardiskPolicy) {
+    std::sort(entries.begin(), entries.end(),
+              [](const auto& a, const auto& b) { return a.name < b.name; });
+  }
+  std::vector<std::string> names;
+  for (SecPolicy::DirectoryEntry& entry : entries) {
+    if (entry.type == DT_REG) {
+      names.push_back(std::move(entry.name));
+    } else {
+      AddSkipped(directory, entry.name, findings);
+    }
+  }
   return names;
+}
+
+void AddUnreadable(const DirectoryToRead& directory, Findings& findings) {
+  const char* text = directory.isTardiskPolicy ? "Unable to open policy directory for tardisks "
+                                               : "Unable to open policy directory ";
+  findings.AddError(Kind::kUnreadable, SpotOf(directory.shown), "the directory cannot be opened",
+                    text + directory.path, "make it; it may be empty");
 }
 
 }  // namespace
@@ -87,22 +92,16 @@ bool IsBackupName(const std::string& name) {
 
 CheckedDirectory ReadDirectory(const DirectoryToRead& directory, Findings& findings) {
   CheckedDirectory read{directory.path, directory.shown, {}};
-  std::vector<std::string> names;
-  try {
-    names = FilesToRead(directory, findings);
-  } catch (const Tavon::Lib::TavonException& failure) {
-    findings.AddError(Kind::kUnreadable, SpotOf(directory.shown), "the directory cannot be opened",
-                      directory.isTardiskPolicy
-                          ? "Unable to open policy directory for tardisks " + directory.path
-                          : failure.what(),
-                      "make it; it may be empty");
+  const auto names = FilesToRead(directory, findings);
+  if (!names) {
+    AddUnreadable(directory, findings);
     return read;
   }
-  for (const std::string& name : names) {
+  for (const std::string& name : *names) {
     CheckedFile file{name, directory.path + "/" + name, directory.shown + "/" + name, {}};
     if (IsBackupName(name)) AddBackup(file.shown, findings);
     try {
-      file.text = ReadPolicyFile(file.path);
+      file.text = ReadPolicyFile(directory.tree, file.path);
     } catch (const std::runtime_error& failure) {
       findings.AddError(Kind::kUnreadable, SpotOf(file), "the file cannot be opened",
                         failure.what(), "make it readable");
@@ -114,10 +113,14 @@ CheckedDirectory ReadDirectory(const DirectoryToRead& directory, Findings& findi
   return read;
 }
 
-void CheckTopEntries(const std::string& path, const std::string& shown, Findings& findings) {
+void CheckTopEntries(const PolicyFiles& policy, Findings& findings) {
   static const std::vector<std::string> kRead{"objects", "domains", "fileLabels", "tardisks"};
-  const std::string prefix = shown + "/";
-  std::vector<std::string> names = NamesIn(path);
+  const std::string prefix = policy.shown + "/";
+  std::vector<std::string> names;
+  SecPolicy::DirectoryStream stream(policy.tree.OpenDirectory(policy.path));
+  while (auto entry = stream.IsOpen() ? stream.Next() : std::nullopt) {
+    names.push_back(std::move(entry->name));
+  }
   std::sort(names.begin(), names.end());
   for (const std::string& name : names) {
     if (name.starts_with(".") || std::find(kRead.begin(), kRead.end(), name) != kRead.end()) {

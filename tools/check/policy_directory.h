@@ -4,6 +4,7 @@
 #include <string>
 #include <vector>
 
+#include "tools/policy/policy_files.h"
 #include "tools/policy/policy_text.h"
 
 namespace SecPolicyTool {
@@ -24,6 +25,7 @@ struct CheckedDirectory {
 
 // What is to be read of a sub-directory.
 struct DirectoryToRead {
+  const StandIn::FileTree& tree;
   std::string path;
   std::string shown;
   // In the order in which the directory lists them, and not by name; entries that are passed over
@@ -38,8 +40,8 @@ class Findings;
 CheckedDirectory ReadDirectory(const DirectoryToRead& directory, Findings& findings);
 
 // Adds the entries of the policy directory itself that a load does not read, as warnings, except
-// those whose names begin with a dot. `shown` is what its user calls it.
-void CheckTopEntries(const std::string& path, const std::string& shown, Findings& findings);
+// those whose names begin with a dot.
+void CheckTopEntries(const PolicyFiles& policy, Findings& findings);
 
 // Whether a name is one that editors and package managers give to copies.
 bool IsBackupName(const std::string& name);

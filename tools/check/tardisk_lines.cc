@@ -1,7 +1,6 @@
 #include "tools/check/tardisk_lines.h"
 
 #include <algorithm>
-#include <filesystem>
 #include <optional>
 
 #include "host/module/module_error.h"
@@ -14,10 +13,9 @@ namespace {
 constexpr char kException[] = "-E";
 
 // The tardisk that brought the file, as a load names it; empty when none did.
-std::string BackingTardisk(const CheckedFile& file, const StandIn::ImageIndex& image) {
-  std::error_code error;
-  const std::string path = std::filesystem::canonical(file.path, error).string();
-  for (const StandIn::TardiskContent& tardisk : image.tardisks) {
+std::string BackingTardisk(const CheckedFile& file, const StandIn::RootIndex& root) {
+  const std::string path = root.Tree().ResolvedOrSame(file.path);
+  for (const StandIn::TardiskContent& tardisk : root.Image().tardisks) {
     if (std::binary_search(tardisk.paths.begin(), tardisk.paths.end(), path)) {
       return std::string(StandIn::kArchivesPath) + "/" + tardisk.name;
     }
@@ -114,7 +112,7 @@ void TardiskFile::CheckLabel(const PolicyLine& line, const LineWord& label) {
 // The tardisk of a file that a load reads; says so when the file does not count.
 std::string CountedTardisk(const CheckedFile& file, std::map<std::string, std::string>& fileOf,
                            CheckContext& context) {
-  std::string tardisk = BackingTardisk(file, context.image);
+  std::string tardisk = BackingTardisk(file, context.root);
   if (tardisk.empty()) {
     context.findings.AddError(Kind::kNoBackingTardisk, SpotOf(file),
                               "the file comes from no tardisk, and a load ignores it",

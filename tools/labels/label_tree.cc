@@ -1,49 +1,62 @@
 #include "tools/labels/label_tree.h"
 
-#include <filesystem>
+#include <dirent.h>
+#include <sys/stat.h>
+
+#include <cerrno>
+#include <cstring>
 #include <map>
 #include <stdexcept>
+
+#include "core/directory_stream.h"
 
 namespace SecPolicyTool {
 
 namespace {
 
-namespace fs = std::filesystem;
+using StandIn::FileTree;
 
-bool IsLabelled(fs::file_type type) {
-  return type == fs::file_type::regular || type == fs::file_type::directory ||
-         type == fs::file_type::character || type == fs::file_type::block ||
-         type == fs::file_type::fifo;
+bool IsLabelled(mode_t type) {
+  return type == S_IFREG || type == S_IFDIR || type == S_IFCHR || type == S_IFBLK ||
+         type == S_IFIFO;
+}
+
+mode_t TypeOfEntry(const FileTree& root, const std::string& path,
+              const SecPolicy::DirectoryEntry& entry) {
+  return entry.type == DT_UNKNOWN ? root.LinkType(path) : DTTOIF(entry.type);
 }
 
 // The directory's entries that are labelled, by name; true for directories.
-std::map<std::string, bool> EntriesOf(const std::string& dir) {
-  std::error_code error;
-  std::map<std::string, bool> entries;
-  for (fs::directory_iterator entry(dir, error), end; !error && entry != end;
-       entry.increment(error)) {
-    const fs::file_type type = entry->symlink_status().type();
-    if (IsLabelled(type)) entries[entry->path().filename()] = type == fs::file_type::directory;
+std::map<std::string, bool> EntriesOf(const FileTree& root, const std::string& dir,
+                                      const std::string& above) {
+  SecPolicy::DirectoryStream stream(root.OpenDirectory(dir));
+  if (!stream.IsOpen()) {
+    throw std::runtime_error(dir + " cannot be listed: " + std::strerror(errno));
   }
-  if (error) throw std::runtime_error(dir + " cannot be listed: " + error.message());
+  std::map<std::string, bool> entries;
+  while (const auto entry = stream.Next()) {
+    const mode_t type = TypeOfEntry(root, above + entry->name, *entry);
+    if (IsLabelled(type)) entries[entry->name] = type == S_IFDIR;
+  }
   return entries;
 }
 
-void ForEachBelow(const std::string& dir, const std::function<void(const std::string&)>& visit) {
+void ForEachBelow(const FileTree& root, const std::string& dir,
+                  const std::function<void(const std::string&)>& visit) {
   const std::string above = dir.ends_with('/') ? dir : dir + "/";
-  for (const auto& [name, isDirectory] : EntriesOf(dir)) {
+  for (const auto& [name, isDirectory] : EntriesOf(root, dir, above)) {
     const std::string path = above + name;
     visit(path);
-    if (isDirectory) ForEachBelow(path, visit);
+    if (isDirectory) ForEachBelow(root, path, visit);
   }
 }
 
 }  // namespace
 
-void ForEachLabelled(const std::string& path, Extent extent,
+void ForEachLabelled(const FileTree& root, const std::string& path, Extent extent,
                      const std::function<void(const std::string&)>& visit) {
   visit(path);
-  if (extent == Extent::kTree && fs::is_directory(path)) ForEachBelow(path, visit);
+  if (extent == Extent::kTree && root.IsDirectory(path)) ForEachBelow(root, path, visit);
 }
 
 }  // namespace SecPolicyTool

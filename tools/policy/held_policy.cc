@@ -2,10 +2,6 @@
 
 #include <cerrno>
 
-#include "host/image/image_file.h"
-#include "host/image/proc_processes.h"
-#include "host/image/state_keeper.h"
-#include "host/module/description_json.h"
 #include "host/module/module_error.h"
 
 namespace SecPolicyTool {
@@ -87,18 +83,14 @@ Policy HeldPolicy(SecurityModule& module, const ImageIndex& image) {
   return policy;
 }
 
-ImageIndex ImageOf(const HostDirectory& host) {
-  return ReadImage(host, [] {}).value_or(ImageIndex());
+Policy HeldPolicy(Kernel& kernel) {
+  return HeldPolicy(kernel.Unobserved(), kernel.Files().Image());
 }
 
-Policy HeldPolicy(const HostDirectory& host) {
-  const ProcProcesses processes;
-  SimulatedModule module(
-      ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile)), processes);
-  StateFile file(host);
-  StateKeeper keeper(file, host.Ref().PathOf(kStateFile), module);
-  const ImageIndex image = ReadImage(host, [&] { keeper.Refresh(); }).value_or(ImageIndex());
-  return HeldPolicy(module, image);
+Policy HeldPolicy(HostDirectory host) {
+  Kernel kernel(std::move(host), {.state = KernelOptions::State::kSnapshot,
+                       .root = KernelOptions::Root::kOptional});
+  return HeldPolicy(kernel);
 }
 
 }  // namespace SecPolicyTool

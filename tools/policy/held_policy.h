@@ -1,9 +1,7 @@
 // What a kernel holds, as a policy.
 #pragma once
 
-#include "host/image/host_directory.h"
-#include "host/image/image_index.h"
-#include "host/module/security_module.h"
+#include "host/kernel/kernel.h"
 #include "tools/policy/policy.h"
 
 namespace SecPolicyTool {
@@ -13,11 +11,11 @@ namespace SecPolicyTool {
 // the module throws.
 Policy HeldPolicy(StandIn::SecurityModule& module, const StandIn::ImageIndex& image);
 
+// The same of a kernel and its files.
+Policy HeldPolicy(StandIn::Kernel& kernel);
+
 // What the kernel of a host holds now. Throws HostError when the host is damaged; one that has not
 // been assembled has no files.
-Policy HeldPolicy(const StandIn::HostDirectory& host);
-
-// The image of a host; an empty one when it has not been assembled. Throws HostError.
-StandIn::ImageIndex ImageOf(const StandIn::HostDirectory& host);
+Policy HeldPolicy(StandIn::HostDirectory host);
 
 }  // namespace SecPolicyTool

@@ -28,16 +28,16 @@ const LabelLine* LabelLines::Lines::Last(const std::optional<std::string>& label
   return found == byLabel_.end() ? nullptr : &found->second;
 }
 
-LabelLines::LabelLines(const PolicyFiles& files) {
+LabelLines::LabelLines(const PolicyFiles& files, const StandIn::FileTree& root) {
   constexpr std::string_view kBelow = "/*";
   std::size_t order = 0;
-  for (const std::string& name : PolicyFileNames(files.path + "/fileLabels")) {
-    for (const PolicyLine& line : PolicyLines(files.path + "/fileLabels/" + name)) {
+  for (const std::string& name : PolicyFileNames(files.tree, files.path + "/fileLabels")) {
+    for (const PolicyLine& line : PolicyLines(files.tree, files.path + "/fileLabels/" + name)) {
       if (line.words.size() != 2) continue;
       std::string path = line.words[0].text;
       const bool isRecursive = path.ends_with(kBelow);
       if (isRecursive) path.erase(path.size() - kBelow.size());
-      path = WithoutLinks(path);
+      path = root.ResolvedOrSame(path);
       if (!path.starts_with('/')) continue;  // leads to no file
       const LabelLine read{order++, line.words[1].text,
                            PlaceOf(files.shown + "/fileLabels/" + name, line)};

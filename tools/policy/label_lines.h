@@ -19,9 +19,9 @@ struct LabelLine {
 
 class LabelLines {
  public:
-  // Reads the directory "fileLabels" of `files`; to be called in the host, whose links decide which
-  // files the lines name. Lines that a load would not take are left out.
-  explicit LabelLines(const PolicyFiles& files);
+  // Reads the directory "fileLabels" of `files`. The links of `root`, the host's, decide which files
+  // the lines name. Lines that a load would not take are left out.
+  LabelLines(const PolicyFiles& files, const StandIn::FileTree& root);
 
   // The last line that labels the file at `path`, an absolute path without links; with `label`, the
   // last one that gives it that label. nullptr when there is none. Valid as long as this object.

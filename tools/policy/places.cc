@@ -1,7 +1,5 @@
 #include "tools/policy/places.h"
 
-#include <sys/prctl.h>
-
 #include <algorithm>
 
 #include "host/module/permission_letters.h"
@@ -32,10 +30,10 @@ bool Says(const PolicyLine& line, const RuleKey& key) {
 }
 
 // The path as the kernel resolves it, or as a load sends it when it cannot.
-std::string ResolvedPath(const std::string& path) {
-  SecPolicy::ZekAccess_FileRule rule{};
-  if (prctl(ZekCtl::Kernel::kPrctlResolvePath, path.c_str(), rule.path) == 0) return rule.path;
-  return path.substr(0, sizeof rule.path - 1);
+std::string ResolvedPath(const StandIn::FileTree& root, const std::string& path) {
+  constexpr std::size_t kMost = ZekCtl::Kernel::kPathBytes - 1;
+  const auto resolved = root.Resolve(path);
+  return resolved && resolved->size() <= kMost ? *resolved : path.substr(0, kMost);
 }
 
 // ---- Rules ----
@@ -50,7 +48,8 @@ void PlaceKeywordRules(const std::string& file, const Lines& lines, DomainConten
   }
 }
 
-void PlacePathRules(const std::string& file, const Lines& lines, DomainContent& domain) {
+void PlacePathRules(const std::string& file, const Lines& lines, const StandIn::FileTree& root,
+                    DomainContent& domain) {
   std::map<std::string, PolicyRule*> rules;
   for (PolicyRule& rule : domain.rules) {
     if (rule.key.type == RuleType::kPath && rule.key.world == 0) rules[rule.key.words[0]] = &rule;
@@ -59,7 +58,7 @@ void PlacePathRules(const std::string& file, const Lines& lines, DomainContent& 
   for (const PolicyLine& line : lines) {
     const std::vector<std::string> words = WordsFrom(line, 0, 4);
     if (words.size() < 2 || words.size() > 3 || words[0] != "-r") continue;
-    const auto rule = rules.find(ResolvedPath(words[1]));
+    const auto rule = rules.find(ResolvedPath(root, words[1]));
     if (rule == rules.end()) continue;
     // Of several lines for a path, the later ones that the kernel took.
     std::string letters = words.size() == 3 ? words[2] : "";
@@ -70,24 +69,24 @@ void PlacePathRules(const std::string& file, const Lines& lines, DomainContent& 
   }
 }
 
-void PlaceDomains(const PolicyFiles& files, Policy& policy) {
-  for (const std::string& name : PolicyFileNames(files.path + "/domains")) {
+void PlaceDomains(const PolicyFiles& files, const StandIn::FileTree& root, Policy& policy) {
+  for (const std::string& name : PolicyFileNames(files.tree, files.path + "/domains")) {
     const auto domain = policy.domains.find(name);
     if (domain == policy.domains.end()) continue;
     const std::string file = files.shown + "/domains/" + name;
-    const Lines lines = PolicyLines(files.path + "/domains/" + name);
+    const Lines lines = PolicyLines(files.tree, files.path + "/domains/" + name);
     domain->second.place = Place{file, 0, 0};
     PlaceKeywordRules(file, lines, domain->second);
-    PlacePathRules(file, lines, domain->second);
+    PlacePathRules(file, lines, root, domain->second);
   }
 }
 
 // ---- Objects ----
 
 void PlaceObjects(const PolicyFiles& files, Policy& policy) {
-  for (const std::string& name : PolicyFileNames(files.path + "/objects")) {
+  for (const std::string& name : PolicyFileNames(files.tree, files.path + "/objects")) {
     const std::string file = files.shown + "/objects/" + name;
-    for (const PolicyLine& line : PolicyLines(files.path + "/objects/" + name)) {
+    for (const PolicyLine& line : PolicyLines(files.tree, files.path + "/objects/" + name)) {
       if (line.words.size() != 1) continue;
       const auto object = policy.objects.find(line.words[0].text);
       if (object == policy.objects.end() || object->second.place) continue;
@@ -98,9 +97,9 @@ void PlaceObjects(const PolicyFiles& files, Policy& policy) {
 
 // ---- File labels ----
 
-void PlaceFileLabels(const PolicyFiles& files, Policy& policy) {
+void PlaceFileLabels(const PolicyFiles& files, const StandIn::FileTree& root, Policy& policy) {
   if (policy.files.empty()) return;
-  const LabelLines lines(files);
+  const LabelLines lines(files, root);
   for (auto& [path, file] : policy.files) {
     if (const LabelLine* line = lines.LineFor(path, file.label)) file.place = line->place;
   }
@@ -116,8 +115,9 @@ std::string TardiskOf(const StandIn::ImageIndex& image, const std::string& path)
   return {};
 }
 
-void PlaceTardisk(const std::string& path, const std::string& tardisk, Policy& policy) {
-  for (const PolicyLine& line : PolicyLines(path)) {
+void PlaceTardisk(const StandIn::FileTree& root, const std::string& path,
+                  const std::string& tardisk, Policy& policy) {
+  for (const PolicyLine& line : PolicyLines(root, path)) {
     if (line.words.size() != 3 || line.words[0].text != "-E") continue;
     const std::string& label = line.words[1].text;
     const auto labelled = policy.tardisks.find(tardisk);
@@ -133,10 +133,10 @@ void PlaceTardisk(const std::string& path, const std::string& tardisk, Policy& p
   }
 }
 
-void PlaceTardisks(const StandIn::ImageIndex& image, Policy& policy) {
-  for (const std::string& name : PolicyFileNames(kTardiskPolicyDir)) {
+void PlaceTardisks(const StandIn::RootIndex& files, Policy& policy) {
+  for (const std::string& name : PolicyFileNames(files.Tree(), kTardiskPolicyDir)) {
     const std::string path = std::string(kTardiskPolicyDir) + "/" + name;
-    PlaceTardisk(path, TardiskOf(image, path), policy);
+    PlaceTardisk(files.Tree(), path, TardiskOf(files.Image(), path), policy);
   }
 }
 
@@ -151,11 +151,11 @@ void ForgetLinesAlone(Policy& policy) {
 
 }  // namespace
 
-void AddPlaces(const PolicyFiles& files, const StandIn::ImageIndex& image, Policy& policy) {
-  PlaceDomains(files, policy);
+void AddPlaces(const PolicyFiles& files, const StandIn::RootIndex& root, Policy& policy) {
+  PlaceDomains(files, root.Tree(), policy);
   PlaceObjects(files, policy);
-  PlaceFileLabels(files, policy);
-  PlaceTardisks(image, policy);
+  PlaceFileLabels(files, root.Tree(), policy);
+  PlaceTardisks(root, policy);
   ForgetLinesAlone(policy);
 }
 

@@ -1,28 +1,20 @@
 #include "tools/policy/policy_files.h"
 
-#include <filesystem>
+#include <algorithm>
 
-#include "secpolicy/secpolicy.h"
+#include "core/directory_stream.h"
 
 namespace SecPolicyTool {
 
-std::vector<std::string> PolicyFileNames(const std::string& dir) {
-  std::map<std::string, std::string> files;
-  try {
-    SecPolicy::GetFileList(dir, files);
-  } catch (const Tavon::Lib::TavonException&) {
-    // A load says so; here there is nothing to be found.
-  }
+std::vector<std::string> PolicyFileNames(const StandIn::FileTree& tree, const std::string& dir) {
+  SecPolicy::DirectoryStream directory(tree.OpenDirectory(dir));
   std::vector<std::string> names;
-  names.reserve(files.size());
-  for (const auto& [path, name] : files) names.push_back(name);
+  if (!directory.IsOpen()) return names;
+  while (auto entry = directory.Next()) {
+    if (entry->type == DT_REG) names.push_back(std::move(entry->name));
+  }
+  std::sort(names.begin(), names.end());
   return names;
-}
-
-std::string WithoutLinks(const std::string& path) {
-  std::error_code error;
-  const std::filesystem::path resolved = std::filesystem::canonical(path, error);
-  return error ? path : resolved.string();
 }
 
 }  // namespace SecPolicyTool

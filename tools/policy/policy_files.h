@@ -4,6 +4,8 @@
 #include <string>
 #include <vector>
 
+#include "host/root/file_tree.h"
+
 namespace SecPolicyTool {
 
 // A host's own policy directory, in the host.
@@ -11,16 +13,15 @@ inline constexpr char kSystemPolicyDir[] = "/etc/olvane/secpolicy";
 // Where every load reads the policy of the tardisks, whatever directory it is given.
 inline constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
 
-// A policy directory: its path in the host, and what its user calls it.
+// A policy directory: the tree that it lies in, its path there, and what its user calls it. The tree
+// has to live as long as this object.
 struct PolicyFiles {
+  const StandIn::FileTree& tree;
   std::string path;
   std::string shown;
 };
 
 // The names of the policy files in `dir`, in the order of a load. None when it cannot be listed.
-std::vector<std::string> PolicyFileNames(const std::string& dir);
-
-// A path by which the kernel knows a file: without links. As it is when there is no such file.
-std::string WithoutLinks(const std::string& path);
+std::vector<std::string> PolicyFileNames(const StandIn::FileTree& tree, const std::string& dir);
 
 }  // namespace SecPolicyTool

@@ -17,21 +17,23 @@ fs::path AbsolutePath(const std::string& dir) {
   if (!path.has_filename()) path = path.parent_path();
   // Behind a link, ".." leads elsewhere than the text says.
   std::error_code ignored;
-  return fs::exists(given) && !fs::equivalent(given, path, ignored) ? fs::canonical(given) : path;
+  return fs::exists(given, ignored) && !fs::equivalent(given, path, ignored) ? fs::canonical(given)
+                                                                             : path;
 }
 
 }  // namespace
 
 PolicyPath LocatePolicy(const std::string& dir) {
-  if (dir.empty()) return {kSystemPolicyDir, {}, kSystemPolicyDir};
-  PolicyPath location{AbsolutePath(dir).string(), {}, dir};
+  if (dir.empty()) return {kSystemPolicyDir, false, kSystemPolicyDir};
+  PolicyPath location{AbsolutePath(dir).string(), false, dir};
   while (location.shown.size() > 1 && location.shown.ends_with('/')) location.shown.pop_back();
-  if (fs::is_directory(location.path)) location.visible.push_back(location.path);
+  std::error_code ignored;
+  location.isOnMachine = fs::is_directory(location.path, ignored);
   return location;
 }
 
-void RequireDirectory(const PolicyPath& policy) {
-  if (!fs::is_directory(policy.path)) {
+void RequireDirectory(const PolicyFiles& policy) {
+  if (!policy.tree.IsDirectory(policy.path)) {
     throw std::runtime_error("there is no policy directory " + policy.path);
   }
 }

@@ -1,28 +1,31 @@
-// The policy directory of a load, as the host is to see it.
+// The policy directory that a user names.
 #pragma once
 
 #include <string>
-#include <vector>
 
+#include "host/kernel/kernel.h"
 #include "tools/policy/policy_files.h"
 
 namespace SecPolicyTool {
 
 struct PolicyPath {
-  std::string path;                  // absolute
-  std::vector<std::string> visible;  // what has to be made visible in the host for it
-  std::string shown;                 // what its user calls it, without slashes at its end
+  std::string path;  // absolute
+  bool isOnMachine;  // else in the host's root
+  std::string shown; // what its user calls it, without slashes at its end
 
-  [[nodiscard]] PolicyFiles Files() const { return {path, shown}; }
+  // Its files; those of the host are the kernel's.
+  [[nodiscard]] PolicyFiles Files(StandIn::Kernel& kernel) const {
+    return {isOnMachine ? StandIn::FileTree::Machine() : kernel.Files().Tree(), path, shown};
+  }
+  // What a use of the library is told; see StandIn::LibraryUse.
+  [[nodiscard]] std::string MachinePath() const { return isOnMachine ? path : std::string(); }
 };
 
-// Where `dir`, as given on the command line, is: a directory outside the host, which is to be seen
-// inside under the same absolute path, or else one that only the host may have. Empty for the
-// host's own, kSystemPolicyDir.
+// Where `dir`, as given on the command line, is: a directory of this machine, or else one that only
+// the host may have. Empty for the host's own, kSystemPolicyDir.
 PolicyPath LocatePolicy(const std::string& dir);
 
-// Throws std::runtime_error "there is no policy directory DIR". To be called in the host, in which
-// the directory may be.
-void RequireDirectory(const PolicyPath& policy);
+// Throws std::runtime_error "there is no policy directory DIR".
+void RequireDirectory(const PolicyFiles& policy);
 
 }  // namespace SecPolicyTool

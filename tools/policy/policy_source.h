@@ -23,11 +23,11 @@ struct SourcePolicy {
 // empty.
 //
 // A directory means what a kernel that has just been started holds once it was loaded: the load is
-// tried in the host with such a kernel, in a process of its own, and nothing of it is kept. Places
-// name files as `source` does. Those of the kernel have lines only.
+// tried with such a kernel in this process's memory, and nothing of it is kept. Places name files
+// as `source` does. Those of the kernel have lines only.
 //
-// Throws std::runtime_error or StandIn::HostError when the host is damaged, has not been assembled
-// or cannot be entered, and "there is no policy directory DIR".
+// Throws StandIn::HostError when the host is damaged or has not been assembled, and
+// std::runtime_error "there is no policy directory DIR".
 SourcePolicy ReadSource(StandIn::HostDirectory host, const std::string& source);
 
 }  // namespace SecPolicyTool

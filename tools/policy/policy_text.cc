@@ -1,9 +1,10 @@
 #include "tools/policy/policy_text.h"
 
 #include <algorithm>
-#include <fstream>
-#include <iterator>
 #include <stdexcept>
+
+#include "host/image/file_io.h"
+#include "secpolicy/host/host_error.h"
 
 namespace SecPolicyTool {
 
@@ -47,15 +48,20 @@ PolicyText ReadPolicyText(std::string_view content) {
   return text;
 }
 
-PolicyText ReadPolicyFile(const std::string& path) {
-  std::ifstream file(path, std::ios::binary);
-  if (!file) throw std::runtime_error("Unable to open policy file " + path);
-  const std::string content{std::istreambuf_iterator<char>(file), {}};
+PolicyText ReadPolicyFile(const StandIn::FileTree& tree, const std::string& path) {
+  const StandIn::UniqueFd file = tree.Open(path, O_RDONLY);
+  if (!file.IsOpen()) throw std::runtime_error("Unable to open policy file " + path);
+  std::string content;
+  try {
+    content = StandIn::ReadAll(file.Get(), path);
+  } catch (const StandIn::HostError&) {
+    // A load takes what precedes a read error for the whole file; of a directory that is nothing.
+  }
   return ReadPolicyText(content);
 }
 
-std::vector<PolicyLine> PolicyLines(const std::string& path) try {
-  return ReadPolicyFile(path).lines;
+std::vector<PolicyLine> PolicyLines(const StandIn::FileTree& tree, const std::string& path) try {
+  return ReadPolicyFile(tree, path).lines;
 } catch (const std::runtime_error&) {
   return {};
 }

@@ -6,6 +6,7 @@
 #include <string_view>
 #include <vector>
 
+#include "host/root/file_tree.h"
 #include "tools/policy/policy.h"
 
 namespace SecPolicyTool {
@@ -38,10 +39,10 @@ PolicyText ReadPolicyText(std::string_view content);
 
 // The same of a file. Throws std::runtime_error "Unable to open policy file " + path, as a load
 // reports it.
-PolicyText ReadPolicyFile(const std::string& path);
+PolicyText ReadPolicyFile(const StandIn::FileTree& tree, const std::string& path);
 
 // The lines of a file; none of one that cannot be opened.
-std::vector<PolicyLine> PolicyLines(const std::string& path);
+std::vector<PolicyLine> PolicyLines(const StandIn::FileTree& tree, const std::string& path);
 
 // Where a line of `file` begins: at its first word.
 Place PlaceOf(const std::string& file, const PolicyLine& line);

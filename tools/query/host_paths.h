@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "host/image/host_directory.h"
-#include "host/image/unique_fd.h"
+#include "host/root/file_tree.h"
 
 namespace SecPolicyTool {
 
@@ -17,13 +17,12 @@ class HostPaths {
 
   // `path`, which begins with "/", with its links and dots followed within the host's root file
   // system. A path that does not lead to a file stays as it is: so does that of a rule.
-  [[nodiscard]] std::string Resolve(const std::string& path) const;
-
-  // Whether `path` leads to a directory that this process can open now.
-  [[nodiscard]] bool OpensDirectory(const std::string& path) const;
+  [[nodiscard]] std::string Resolve(const std::string& path) const {
+    return root_.ResolvedOrSame(path);
+  }
 
  private:
-  StandIn::UniqueFd root_;
+  StandIn::FileTree root_;
 };
 
 // The paths of the host's files that a file label for a directory and everything below it would

@@ -50,13 +50,13 @@ json TardisksJson(const Policy& policy, const StandIn::ImageIndex& image) {
 
 }  // namespace
 
-json HeldJson(StandIn::SecurityModule& module, const StandIn::ImageIndex& image,
-              const std::optional<unsigned int>& domain) {
-  const Policy policy = HeldPolicy(module, image);
+json HeldJson(StandIn::Kernel& kernel, const std::optional<unsigned int>& domain) {
+  const Policy policy = HeldPolicy(kernel);
+  const StandIn::ThreadAttachment attachment(kernel.Attachment());
   ZekAccessInterfaceImpl iface;
   return {{"domains", DomainsJson(policy, domain, iface)},
           {"objects", ObjectsJson(iface)},
-          {"tardisks", TardisksJson(policy, image)}};
+          {"tardisks", TardisksJson(policy, kernel.Files().Image())}};
 }
 
 }  // namespace SecPolicyTool

@@ -4,15 +4,12 @@
 #include <nlohmann/json_fwd.hpp>
 #include <optional>
 
-#include "host/image/image_index.h"
-#include "host/module/security_module.h"
+#include "host/kernel/kernel.h"
 
 namespace SecPolicyTool {
 
-// docs/schemas/show.schema.json: everything that `module` holds, or of the domains only the one
-// with the id `domain`, which may be none. Called in the host, whose image is `image`. Throws what
-// the module throws.
-nlohmann::json HeldJson(StandIn::SecurityModule& module, const StandIn::ImageIndex& image,
-                        const std::optional<unsigned int>& domain);
+// docs/schemas/show.schema.json: everything that `kernel` holds, or of the domains only the one with
+// the id `domain`, which may be none. Throws what the module throws.
+nlohmann::json HeldJson(StandIn::Kernel& kernel, const std::optional<unsigned int>& domain);
 
 }  // namespace SecPolicyTool

@@ -93,9 +93,10 @@ CommandLine DomainVerbOf(const char* name, const char* description,
           .options = {HostOption(arguments->host)},
           .operands = std::move(operands),
           .run = [arguments, run] {
-            const auto session = EnterHost(arguments->host);
-            run(*arguments);
-            return kDone;
+            return ReadHost(arguments->host, [&](StandIn::Kernel&) {
+              run(*arguments);
+              return kDone;
+            });
           }};
 }
 
@@ -104,9 +105,10 @@ CommandLine DomainChangeOf(CommandLine verb, const SharedDomainArguments& argume
                            void (*change)(const DomainArguments&)) {
   AddChangeOptions(verb, arguments->changes);
   verb.run = [arguments, change] {
-    const auto session = EnterHost(arguments->host, {}, arguments->changes);
-    ChangeHost(*session, [&] { change(*arguments); });
-    return kDone;
+    return ChangeHost(arguments->host, arguments->changes, [&](StandIn::Kernel&) {
+      change(*arguments);
+      return kDone;
+    });
   };
   return verb;
 }

@@ -122,9 +122,10 @@ CommandLine FilesVerbOf(const char* name, const char* description,
                    .options = {HostOption(arguments->host)},
                    .operands = std::move(operands),
                    .run = [arguments, run] {
-                     const auto session = EnterHost(arguments->host);
-                     run(*arguments);
-                     return kDone;
+                     return ReadHost(arguments->host, [&](StandIn::Kernel&) {
+                       run(*arguments);
+                       return kDone;
+                     });
                    }};
   verb.options.insert(verb.options.end(), options.begin(), options.end());
   return verb;
@@ -140,9 +141,10 @@ CommandLine FilesChangeOf(const char* name, const char* description,
       FilesVerbOf(name, description, arguments, change, std::move(operands), options);
   AddChangeOptions(verb, arguments->changes);
   verb.run = [arguments, change] {
-    const auto session = EnterHost(arguments->host, {}, arguments->changes);
-    ChangeHost(*session, [&] { change(*arguments); });
-    return kDone;
+    return ChangeHost(arguments->host, arguments->changes, [&](StandIn::Kernel&) {
+      change(*arguments);
+      return kDone;
+    });
   };
   return verb;
 }

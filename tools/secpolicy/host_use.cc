@@ -1,30 +1,37 @@
 #include "tools/secpolicy/host_use.h"
 
-#include <syslog.h>
-
 #include <limits>
 
+#include "tools/policy/library_output.h"
 #include "tools/secpolicy/host_option.h"
 
 namespace SecPolicyTool {
 
-std::unique_ptr<StandIn::Session> EnterHost(const std::string& dir,
-                                            const StandIn::SessionOptions& options,
-                                            const StandIn::ChangeOptions& changes) {
-  // Before the root directory changes: the connection to the system log stays.
-  openlog("secpolicy", LOG_NDELAY, LOG_USER);
-  return std::make_unique<StandIn::Session>(OpenHost(dir, changes), options);
+using StandIn::Kernel;
+using StandIn::LibraryUse;
+
+ExitStatus ReadHost(const std::string& dir, const HostWork& work) {
+  Kernel kernel(OpenHost(dir), {.state = StandIn::KernelOptions::State::kSnapshot});
+  SystemLog log;
+  const LibraryUse use(kernel, log);
+  return work(kernel);
 }
 
-void ChangeHost(StandIn::Session& session, const std::function<void()>& change) {
-  session.BeginBatch();
+ExitStatus ChangeHost(const std::string& dir, const StandIn::ChangeOptions& changes,
+                      const HostWork& work, const StandIn::KernelOptions& options) {
+  Kernel kernel(OpenHost(dir, changes), options);
+  SystemLog log;
+  const LibraryUse use(kernel, log);
+  kernel.BeginBatch();
+  ExitStatus status{};
   try {
-    change();
+    status = work(kernel);
   } catch (...) {
-    session.Commit();
+    kernel.Commit();
     throw;
   }
-  session.Commit();
+  kernel.Commit();
+  return status;
 }
 
 int WorldId(const std::string& text) {

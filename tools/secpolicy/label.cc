@@ -6,6 +6,7 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
+#include "host/doors/library_use.h"
 #include "secpolicy/secpolicy.h"
 #include "tools/labels/descriptor_limit.h"
 #include "tools/labels/label_tree.h"
@@ -23,6 +24,7 @@ namespace SecPolicyTool {
 
 using nlohmann::json;
 using SecPolicy::ZekAccessInterfaceImpl;
+using StandIn::FileTree;
 
 namespace {
 
@@ -59,10 +61,11 @@ void RequireAbsolute(const std::string& path) {
 
 // Hands the label of each file to `use`; one that cannot be read is reported.
 template <typename Use>
-void ForEachLabel(const LabelArguments& arguments, Results& results, const Use& use) {
+void ForEachLabel(const FileTree& root, const LabelArguments& arguments, Results& results,
+                  const Use& use) {
   ZekAccessInterfaceImpl iface;
   Progress progress("Reading labels");
-  ForEachLabelled(arguments.path, arguments.Reach(), [&](const std::string& path) {
+  ForEachLabelled(root, arguments.path, arguments.Reach(), [&](const std::string& path) {
     progress.Step();
     std::string label;
     try {
@@ -75,8 +78,8 @@ void ForEachLabel(const LabelArguments& arguments, Results& results, const Use& 
   });
 }
 
-void Get(const LabelArguments& arguments, Results& results) {
-  ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
+void Get(const FileTree& root, const LabelArguments& arguments, Results& results) {
+  ForEachLabel(root, arguments, results, [&](const std::string& path, const std::string& label) {
     if (arguments.isJson) {
       results.rows.push_back({{"path", path}, {"label", label}});
     } else {
@@ -87,10 +90,10 @@ void Get(const LabelArguments& arguments, Results& results) {
 }
 
 // What Set would change.
-void ShowChanges(const LabelArguments& arguments, Results& results) {
+void ShowChanges(const FileTree& root, const LabelArguments& arguments, Results& results) {
   ZekAccessInterfaceImpl iface;
   iface.LookupLabel(arguments.label, ZekCtl::Security::kObjectLabel);
-  ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
+  ForEachLabel(root, arguments, results, [&](const std::string& path, const std::string& label) {
     if (label == arguments.label) return;
     std::cout << (TerminalText(path) + ": " + label + " -> " + arguments.label).EndLine();
   });
@@ -113,12 +116,13 @@ std::string Below(const std::string& resolved, const std::string& dir, const std
 }
 
 // Compares the files' labels with those that the policy gives them.
-void Verify(const LabelArguments& arguments, const PolicyFiles& files, Results& results) {
-  const LabelLines lines(files);
+void Verify(const FileTree& root, const LabelArguments& arguments, const PolicyFiles& files,
+            Results& results) {
+  const LabelLines lines(files, root);
   // Links are looked for once: there are none between a tree's root and its files.
-  const std::string root = WithoutLinks(arguments.path);
-  ForEachLabel(arguments, results, [&](const std::string& path, const std::string& label) {
-    const LabelLine* line = lines.LineFor(Below(root, arguments.path, path));
+  const std::string resolved = root.ResolvedOrSame(arguments.path);
+  ForEachLabel(root, arguments, results, [&](const std::string& path, const std::string& label) {
+    const LabelLine* line = lines.LineFor(Below(resolved, arguments.path, path));
     if (line == nullptr || line->label == label) return;
     results.status = kFailed;
     if (arguments.isJson) {
@@ -136,48 +140,60 @@ void Verify(const LabelArguments& arguments, const PolicyFiles& files, Results& 
 }
 
 ExitStatus RunGet(const LabelArguments& arguments) {
-  Results results;
-  const auto session = EnterHost(arguments.host);
-  Get(arguments, results);
-  return results.status;
+  return ReadHost(arguments.host, [&](StandIn::Kernel& kernel) {
+    Results results;
+    Get(kernel.Files().Tree(), arguments, results);
+    return results.status;
+  });
+}
+
+ExitStatus RunDry(const LabelArguments& arguments) {
+  return ReadHost(arguments.host, [&](StandIn::Kernel& kernel) {
+    Results results;
+    ShowChanges(kernel.Files().Tree(), arguments, results);
+    return results.status;
+  });
 }
 
 ExitStatus RunSet(const LabelArguments& arguments) {
-  Results results;
-  if (arguments.isDryRun) {
-    const auto session = EnterHost(arguments.host);
-    ShowChanges(arguments, results);
-    return results.status;
-  }
-  StandIn::SessionOptions options;
+  if (arguments.isDryRun) return RunDry(arguments);
+  StandIn::KernelOptions options;
   Progress progress("Setting labels");
   // One operation sets one label; their lines are put together only for who is shown the progress.
   if (isatty(STDERR_FILENO) == 1) options.trace = [&](const std::string&) { progress.Step(); };
-  const auto session = EnterHost(arguments.host, options, arguments.changes);
-  session->BeginBatch();
-  try {
-    SetLabels(arguments);
-  } catch (const std::exception& failure) {
-    results.Fail(failure.what());
-    const std::string reason = DescriptorLimitReason(failure.what(), OpensDirectory);
-    if (!reason.empty()) results.Fail(reason);
+  const auto set = [&](StandIn::Kernel&) {
+    Results results;
+    try {
+      SetLabels(arguments);
+    } catch (const std::exception& failure) {
+      // What was set before a failure stays set.
+      results.Fail(failure.what());
+      if (StandIn::LibraryUse::Current()->TakeDescriptorShortage()) {
+        results.Fail(DescriptorLimitReason());
+      }
+    }
+    return results.status;
+  };
+  return ChangeHost(arguments.host, arguments.changes, set, options);
+}
+
+// Throws as a load does of a directory of file labels that cannot be opened.
+void RequireFileLabels(const PolicyFiles& files) {
+  const std::string dir = files.path + "/fileLabels";
+  if (!files.tree.IsDirectory(dir)) {
+    throw std::runtime_error("Unable to open policy directory " + dir);
   }
-  // What was set before a failure stays set.
-  session->Commit();
-  return results.status;
 }
 
 ExitStatus RunVerify(const LabelArguments& arguments) {
-  Results results;
   const PolicyPath policy = LocatePolicy(arguments.policy);
-  StandIn::SessionOptions options;
-  options.visible = policy.visible;
-  const auto session = EnterHost(arguments.host, options);
-  const PolicyFiles files = policy.Files();
-  std::map<std::string, std::string> listed;
-  SecPolicy::GetFileList(files.path + "/fileLabels", listed);
-  Verify(arguments, files, results);
-  return results.status;
+  return ReadHost(arguments.host, [&](StandIn::Kernel& kernel) {
+    Results results;
+    const PolicyFiles files = policy.Files(kernel);
+    RequireFileLabels(files);
+    Verify(kernel.Files().Tree(), arguments, files, results);
+    return results.status;
+  });
 }
 
 using SharedLabelArguments = std::shared_ptr<LabelArguments>;

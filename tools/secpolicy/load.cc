@@ -1,24 +1,15 @@
 // secpolicy load [--host DIR] [--wait SECONDS] [--trace] [--fail OPERATION[:N]] [POLICYDIR]
-#include <sys/wait.h>
 #include <unistd.h>
 
-#include <cstring>
-#include <exception>
 #include <iostream>
 #include <memory>
-#include <stdexcept>
 
-#include "host/image/session.h"
 #include "tools/labels/descriptor_limit.h"
-#include "tools/policy/child_process.h"
-#include "tools/policy/error_messages.h"
+#include "tools/policy/batch_load.h"
+#include "tools/policy/library_output.h"
 #include "tools/policy/output.h"
-#include "tools/policy/policy_path.h"
 #include "tools/policy/progress.h"
-#include "tools/policy/progress_filter.h"
 #include "tools/policy/terminal.h"
-#include "tools/query/host_paths.h"
-#include "tools/requests/batch_load.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/source_option.h"
 #include "tools/secpolicy/verbs.h"
@@ -35,80 +26,83 @@ struct LoadArguments {
   std::vector<StandIn::Fault> faults;
 };
 
-// What the terminate handler needs, which is not handed anything.
-struct Loading {
-  StandIn::Session& session;
-  std::string stateFile;
-};
-const Loading* loading = nullptr;
+// Progress and errors, as they come, on standard error and in the system log.
+class LoadOutput final : public StandIn::LibraryOutput {
+ public:
+  void OnInfo(const std::string& message) override {
+    Print(message);
+    LogProgress(message);
+  }
+  void OnError(const std::string& message, const Tavon::Lib::TavonException*) override {
+    Print("Error: " + message);
+    LogFailure(message);
+    AddReason();
+  }
+  void OnPrint(const std::string&) override {}
 
-// A kernel keeps what was installed before the process ended, and so does this one.
-[[noreturn]] void OnTerminate() {
+  void OnOperation(const std::string& line) { Print("kernel: " + line); }
+  // The kernel has something to do.
+  void Tick() { progress_.Tick(); }
+
+ private:
+  void Print(const std::string& line) {
+    progress_.Clear();
+    PrintLine(std::cerr, line);
+  }
+  // The first error of its kind is explained.
+  void AddReason() {
+    if (isReasonShown_) return;
+    StandIn::LibraryUse* use = StandIn::LibraryUse::Current();
+    isReasonShown_ = use != nullptr && use->TakeDescriptorShortage();
+    if (isReasonShown_) ReportError(DescriptorLimitReason());
+  }
+
+  SystemLog log_;
+  Progress progress_{"Loading"};
+  bool isReasonShown_ = false;
+};
+
+// Shows that time passes.
+class Ticks final : public StandIn::OperationHook {
+ public:
+  void Around(const StandIn::OperationCall&, const StandIn::Callable<void>& proceed) override {
+    if (output != nullptr) output->Tick();
+    proceed();
+  }
+
+  LoadOutput* output = nullptr;
+};
+
+// Keeps what a load installed that was terminated.
+void KeepTerminated(StandIn::Kernel& kernel) {
   try {
-    loading->session.Commit();
+    kernel.Commit();
     ReportError("the load was terminated before its end; what it had installed until then is in " +
-                loading->stateFile);
+                kernel.Directory().Ref().PathOf(StandIn::kStateFile));
   } catch (const std::exception& failure) {
-    ReportError(std::string("the load was terminated, and what it had installed is lost: ") +
+    ReportError("the load was terminated, and what it had installed is lost: " +
                 MessageOf(failure));
   }
-  _exit(kTerminated);
-}
-
-StandIn::SessionOptions OptionsOf(const LoadArguments& arguments, const PolicyPath& policy) {
-  StandIn::SessionOptions options{
-      .visible = policy.visible, .trace = nullptr, .faults = arguments.faults};
-  if (arguments.trace) {
-    options.trace = [](const std::string& line) { std::cerr << "kernel: " + line + "\n"; };
-  }
-  return options;
-}
-
-// LoadPolicy in the host, kept as a whole. Runs in the child.
-int LoadIn(StandIn::HostDirectory host, const LoadArguments& arguments) {
-  const PolicyPath policy = LocatePolicy(arguments.policy);
-  OpenProgressLog();
-  const std::string stateFile = host.Ref().PathOf(StandIn::kStateFile);
-  StandIn::Session session(std::move(host), OptionsOf(arguments, policy));
-  const Loading current{session, stateFile};
-  loading = &current;
-  std::set_terminate(OnTerminate);
-  const LoadEnd end = LoadInBatch(session, policy.path);
-  session.Commit();
-  return end == LoadEnd::kDone ? kDone : kFailed;
-}
-
-// The load may have been over but for its exit, or another process may have written.
-std::string WhatTheKernelHolds(bool isWritten) {
-  return isWritten ? "the kernel's state has been written since it began, see \"secpolicy show\""
-                   : "the kernel holds what it held before";
 }
 
 ExitStatus Load(const LoadArguments& arguments) {
-  StandIn::HostDirectory host = OpenHost(arguments.host, arguments.changes);
-  const HostPaths paths(host);
-  const StandIn::StateFile state(host);
-  const StandIn::StateFile::Version before = state.CurrentVersion();
-  Progress progress("Loading");
-  const auto show = [&, isReasonShown = false](std::string& line) mutable {
-    if (!FilterProgress(line)) return;
-    progress.Clear();
-    PrintLine(std::cerr, line);
-    if (isReasonShown) return;
-    const std::string reason = DescriptorLimitReason(
-        line, [&](const std::string& dir) { return paths.OpensDirectory(dir); });
-    isReasonShown = !reason.empty();
-    if (isReasonShown) ReportError(reason);
-  };
-  const int status = RunInChild([&] { return LoadIn(std::move(host), arguments); }, show,
-                                [&] { progress.Tick(); });
-  progress.Clear();
-  if (WIFSIGNALED(status)) {
-    ReportError(std::string("the load was killed (") + strsignal(WTERMSIG(status)) + "); " +
-                WhatTheKernelHolds(state.ChangedSince(before)));
-    return kFailed;
+  const PolicyPath policy = LocatePolicy(arguments.policy);
+  Ticks ticks;
+  StandIn::KernelOptions options{.faults = arguments.faults};
+  if (arguments.trace) {
+    options.trace = [&](const std::string& line) { ticks.output->OnOperation(line); };
   }
-  return static_cast<ExitStatus>(WEXITSTATUS(status));
+  if (isatty(STDERR_FILENO) == 1) options.hooks.push_back(&ticks);
+  StandIn::Kernel kernel(OpenHost(arguments.host, arguments.changes), options);
+  LoadOutput output;
+  ticks.output = &output;
+  const StandIn::LoadEnd end = LoadInBatch(policy, kernel, output);
+  if (end == StandIn::LoadEnd::kTerminated) {
+    KeepTerminated(kernel);
+    return kTerminated;
+  }
+  kernel.Commit();
+  return end == StandIn::LoadEnd::kDone ? kDone : kFailed;
 }
 
 }  // namespace

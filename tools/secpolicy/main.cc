@@ -1,7 +1,7 @@
+#include <csignal>
 #include <exception>
 #include <iostream>
 
-#include "tools/policy/error_messages.h"
 #include "tools/policy/output.h"
 #include "tools/policy/terminal.h"
 #include "tools/secpolicy/verbs.h"
@@ -39,6 +39,8 @@ ExitStatus Run(int argc, char** argv) {
 }  // namespace SecPolicyTool
 
 int main(int argc, char** argv) {
+  // A write beyond the limit of file sizes fails and is reported, as one on a full disk is.
+  std::signal(SIGXFSZ, SIG_IGN);
   const SecPolicyTool::TerminalOutput output;
   try {
     return SecPolicyTool::Run(argc, argv);

@@ -6,7 +6,6 @@
 #include <stdexcept>
 
 #include "secpolicy/secpolicy.h"
-#include "tools/policy/held_policy.h"
 #include "tools/policy/output.h"
 #include "tools/requests/held_json.h"
 #include "tools/secpolicy/host_option.h"
@@ -30,16 +29,16 @@ void RequireDomain(StandIn::SecurityModule& module, unsigned int domain) {
   }
 }
 
-void Show(const ShowArguments& arguments) {
-  const StandIn::ImageIndex image = ImageOf(OpenHost(arguments.host));
-  StandIn::SessionOptions options;
-  options.kernel = StandIn::SessionOptions::Kernel::kSnapshot;
-  const auto session = EnterHost(arguments.host, options);
-  if (arguments.domain) RequireDomain(session->Module(), *arguments.domain);
-  if (arguments.isJson) {
-    return PrintJson(HeldJson(session->Module(), image, arguments.domain));
-  }
-  SecPolicy::DisplayPolicy(arguments.domain ? std::to_string(*arguments.domain) : "");
+ExitStatus Show(const ShowArguments& arguments) {
+  return ReadHost(arguments.host, [&](StandIn::Kernel& kernel) {
+    if (arguments.domain) RequireDomain(kernel.Module(), *arguments.domain);
+    if (arguments.isJson) {
+      PrintJson(HeldJson(kernel, arguments.domain));
+    } else {
+      SecPolicy::DisplayPolicy(arguments.domain ? std::to_string(*arguments.domain) : "");
+    }
+    return kDone;
+  });
 }
 
 }  // namespace
@@ -56,10 +55,7 @@ CommandLine ShowVerb() {
                               arguments->domain = static_cast<unsigned int>(
                                   WholeNumber(text, 0, std::numeric_limits<unsigned int>::max()));
                             }}},
-          .run = [arguments] {
-            Show(*arguments);
-            return kDone;
-          }};
+          .run = [arguments] { return Show(*arguments); }};
 }
 
 }  // namespace SecPolicyTool

@@ -1,65 +1,100 @@
 // Tables that change while they are read.
 #include "tools/kernel/tables.h"
 
-#include <cstring>
+#include <gtest/gtest.h>
 
-#include "platform/private_calls.h"
-#include "tests/support/host_test.h"
-#include "tests/support/scripted_kernel.h"
+#include <cerrno>
+#include <optional>
+
+#include "host/module/description_json.h"
+#include "host/module/module_error.h"
+#include "tests/support/memory_host.h"
 
 namespace SecPolicyTool {
 namespace {
 
-using SecPolicyTest::KernelAnswer;
-using SecPolicyTest::Outcome;
-using SecPolicyTest::ScriptedKernel;
-using SecPolicyTest::SeenCall;
-using ZekCtl::Kernel::PrivateCall;
+using StandIn::Operation;
 
-class TablesTest : public SecPolicyTest::HostTest {
- protected:
-  // Reads the table from a kernel that says it has each of `counts` rules in turn, and holds the
-  // last number of them.
-  Outcome ReadFrom(std::vector<std::uint32_t> counts, std::uint32_t held) {
-    return Run([&]() -> std::string {
-      std::size_t asked = 0;
-      const ScriptedKernel kernel([&](const SeenCall& call) -> KernelAnswer {
-        if (call.number == static_cast<long>(PrivateCall::kCountRules)) {
-          *call.At<std::uint32_t>(1) = counts.at(asked++);
-          return {};
-        }
-        if (call.arguments[2] < held) return {ZekCtl::Kernel::kStatusTableTooSmall, 0};
-        auto* rules = call.At<SecPolicy::ZekAccess_FileRule>(1);
-        for (std::uint32_t i = 0; i < held; ++i) std::strcpy(rules[i].path, "/a");
-        return {};
-      });
-      const std::size_t size = ReadFileRules(3).size();
-      return std::to_string(size) + " rules after " + std::to_string(kernel.Calls().size()) +
-             " calls";
-    });
+// After each count of a domain's rules, the domain has another number of them.
+class ChangingTable final : public StandIn::OperationHook {
+ public:
+  ChangingTable(StandIn::SecurityModule& module, StandIn::DomainId domain,
+                std::vector<std::uint32_t> sizes)
+      : module_(module), domain_(domain), sizes_(std::move(sizes)) {
+    Resize(sizes_.front());
   }
+
+  void Around(const StandIn::OperationCall& call, const StandIn::Callable<void>& proceed) override {
+    ++calls;
+    if (refusal) throw StandIn::ModuleError(*refusal, "refused");
+    proceed();
+    if (call.operation == Operation::kCountFileRules && next_ < sizes_.size()) {
+      Resize(sizes_[next_++]);
+    }
+  }
+
+  std::size_t calls = 0;
+  std::optional<int> refusal;  // of every call
+
+ private:
+  void Resize(std::uint32_t size) {
+    for (; size_ < size; ++size_) {
+      std::uint32_t taken = 0;
+      module_.AddFileRules(domain_, {{0, "/" + std::to_string(size_), 1}}, taken);
+    }
+    for (; size_ > size; --size_) {
+      module_.RemoveFileRule(0, domain_, "/" + std::to_string(size_ - 1));
+    }
+  }
+
+  StandIn::SecurityModule& module_;
+  StandIn::DomainId domain_;
+  std::vector<std::uint32_t> sizes_;
+  std::size_t next_ = 1;
+  std::uint32_t size_ = 0;
+};
+
+class TablesTest : public testing::Test {
+ protected:
+  // Reads the table of a domain whose rules are as many as each of `sizes` in turn.
+  std::string ReadFrom(std::vector<std::uint32_t> sizes) {
+    const StandIn::DomainId domain =
+        host_.Module().CreateDomain("domain", StandIn::DomainOrigin::kPolicy);
+    ChangingTable table(host_.Module(), domain, std::move(sizes));
+    host_.Add(table);
+    const std::size_t size = ReadFileRules(domain).size();
+    return std::to_string(size) + " rules after " + std::to_string(table.calls) + " calls";
+  }
+
+  SecPolicyTest::MemoryHost host_{
+      StandIn::ReadDescription(StandIn::DefaultDescriptionText(), "host.json")};
 };
 
 TEST_F(TablesTest, IsReadAtOnceWhenNothingChanges) {
-  EXPECT_EQ(ReadFrom({2}, 2).value, "2 rules after 2 calls");
-  EXPECT_EQ(ReadFrom({0}, 0).value, "0 rules after 2 calls");
+  EXPECT_EQ(ReadFrom({2}), "2 rules after 2 calls");
 }
 
+TEST_F(TablesTest, EmptyTableIsEmpty) { EXPECT_EQ(ReadFrom({0}), "0 rules after 2 calls"); }
+
 TEST_F(TablesTest, IsReadAgainWhileRulesAreAdded) {
-  EXPECT_EQ(ReadFrom({1, 2, 3}, 3).value, "3 rules after 6 calls");
+  EXPECT_EQ(ReadFrom({1, 2, 3}), "3 rules after 6 calls");
 }
 
 TEST_F(TablesTest, RulesThatWereRemovedMeanwhileAreNotShown) {
-  EXPECT_EQ(ReadFrom({5}, 2).value, "2 rules after 2 calls");
+  EXPECT_EQ(ReadFrom({5, 2}), "2 rules after 2 calls");
 }
 
 TEST_F(TablesTest, OtherFailuresPass) {
-  const Outcome outcome = Run([] {
-    const ScriptedKernel kernel(KernelAnswer{1, -EIO});
+  ChangingTable table(host_.Module(), 0, {0});
+  table.refusal = EIO;
+  host_.Add(table);
+  try {
     ReadFileRules(3);
-  });
-  EXPECT_EQ(outcome.error,
-            "Failed to get number of file policies for domain :: 3:Input/output error");
+    FAIL() << "nothing was thrown";
+  } catch (const Tavon::Lib::TavonException& failure) {
+    EXPECT_STREQ(failure.what(),
+                 "Failed to get number of file policies for domain :: 3:Input/output error");
+  }
 }
 
 }  // namespace

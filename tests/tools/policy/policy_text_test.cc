@@ -39,7 +39,7 @@ TEST(PolicyTextTest, FileThatCannotBeOpenedIsReportedAsInALoad) {
   EXPECT_THROW(
       {
         try {
-          ReadPolicyFile("/nowhere/file");
+          ReadPolicyFile(StandIn::FileTree::Machine(), "/nowhere/file");
         } catch (const std::runtime_error& failure) {
           EXPECT_STREQ(failure.what(), "Unable to open policy file /nowhere/file");
           throw;
@@ -69,7 +69,7 @@ TEST(PolicyTextTest, ReadsWhatTheLibraryReads) {
         full + "x\nb", full + "x", full.substr(9) + " last more\nb", std::string("#\n#\nz")}) {
     StandIn::WriteBytes(path, content);
     std::map<unsigned int, std::vector<std::string>> lines;
-    for (const PolicyLine& line : ReadPolicyFile(path).lines) {
+    for (const PolicyLine& line : ReadPolicyFile(StandIn::FileTree::Machine(), path).lines) {
       for (const LineWord& word : line.words) lines[line.number].push_back(word.text);
     }
     EXPECT_EQ(lines, AsTheLibraryReads(path)) << content.substr(0, 40);

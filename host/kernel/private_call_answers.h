@@ -5,6 +5,7 @@
 #include <cstdint>
 
 #include "host/attached_host.h"
+#include "host/kernel/caller_memory.h"
 
 namespace StandIn {
 
@@ -16,9 +17,12 @@ struct PrivateAnswer {
 
 using CallArguments = std::array<std::uint64_t, 6>;
 
-// Answers call `number`, whose addresses may be anything. Never throws.
+// Whether the number is one of the module's own.
+bool IsPrivateCall(long number) noexcept;
+
+// Answers call `number`, whose addresses are those of `memory`. Never throws.
 PrivateAnswer AnswerPrivateCall(const AttachedHost& host, long number,
-                                const CallArguments& arguments) noexcept;
+                                const CallArguments& arguments, CallerMemory& memory) noexcept;
 
 // The answer of a kernel that refuses with this errno.
 PrivateAnswer Refusal(int number) noexcept;
