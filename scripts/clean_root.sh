@@ -29,13 +29,41 @@ unmount_root() {
 }
 
 remove_root() {
+  end_processes
   unmount_root
   # What could not be unmounted is not looked into.
   rm -rf --one-file-system "$work"
 }
 
-# inside COMMAND...: runs it in the system.
-inside() { LC_ALL=C.UTF-8 DEBIAN_FRONTEND=noninteractive chroot "$root" "$@"; }
+# in_namespaces PROC COMMAND...: runs it with mounts and process ids of its own, whose /proc is mounted at
+# PROC. Nothing that it starts or mounts outlives it or the calling script. It runs in the background
+# because bash handles a signal only when the command in the foreground has ended; there, SIGINT and
+# SIGQUIT would be ignored unless they were reset.
+in_namespaces() {
+  local status=0
+  setpriv --pdeathsig KILL \
+    unshare --pid --fork --kill-child --mount-proc="$1" env --default-signal "${@:2}" <&0 &
+  namespaces_pid=$!
+  wait "$namespaces_pid" || status=$?
+  namespaces_pid=
+  return "$status"
+}
+
+# Kills what in_namespaces still runs. The kernel ends all processes of the namespace with its first one.
+end_processes() {
+  local first=
+  [ -n "${namespaces_pid-}" ] || return 0
+  read -r first <"/proc/$namespaces_pid/task/$namespaces_pid/children" || true
+  kill -KILL "${first:-$namespaces_pid}" || true
+  wait "$namespaces_pid" || true
+} 2>/dev/null
+
+# inside COMMAND...: runs it in the system. The system's root becomes that of the mount namespace: in a
+# directory entered by chroot, the kernel lets no ordinary user create a user namespace.
+inside() {
+  LC_ALL=C.UTF-8 DEBIAN_FRONTEND=noninteractive in_namespaces "$root/proc" \
+    sh -c 'cd "$0" && pivot_root . mnt && umount -l /mnt && exec "$@"' "$root" "$@"
+}
 
 install_packages() { inside apt-get install -q -y --no-install-recommends "$@" >"$work/apt.log" 2>&1 || {
   cat "$work/apt.log" >&2
@@ -59,14 +87,13 @@ make_root() {
     echo "apt-get names no Debian mirror for $(own_release)" >&2
     return 1
   }
-  /usr/sbin/debootstrap --variant=minbase "$1" "$root" "$mirror" >"$work/debootstrap.log" || {
+  in_namespaces /proc /usr/sbin/debootstrap --variant=minbase "$1" "$root" "$mirror" >"$work/debootstrap.log" || {
     tail -n 20 "$work/debootstrap.log" >&2
     return 1
   }
-  # A root directory is a mount point, to systems as to those who enter a host.
+  # pivot_root takes only a mount point.
   mount --bind "$root" "$root"
   cp -L /etc/resolv.conf "$root/etc/resolv.conf"
-  mount -t proc proc "$root/proc"
   mount -t sysfs -o ro sysfs "$root/sys"
   mount --bind /dev "$root/dev"
   mount --bind /dev/pts "$root/dev/pts"
