@@ -87,6 +87,10 @@ bool FindPlace(const json& value, const json& sought, json::json_pointer& place)
 }  // namespace
 
 json ParseJson(const std::string& text, const std::string& file) {
+  // The parser's message for an empty text differs between its versions.
+  if (text.empty()) {
+    throw HostError(StrCat(file, ":1:1: syntax error: the file is empty"));
+  }
   try {
     ParseGuard guard(file);
     return json::parse(text, [&guard](int depth, json::parse_event_t event, json& parsed) {

@@ -39,7 +39,7 @@ TEST(ParseJson, NamesLineAndColumnOfAnError) {
     const char* start;
   };
   const Row rows[] = {
-      {"", "a.json:1:1: syntax error"},
+      {"", "a.json:1:1: syntax error: the file is empty"},
       {"x", "a.json:1:1: syntax error"},
       {"{\"a\": 1,\n \"b\" 2}", "a.json:2:6: syntax error"},
       {"[1,\n\n  nil]", "a.json:3:4: syntax error"},
