@@ -20,6 +20,19 @@ if(SECPOLICY_WERROR)
   target_compile_options(secpolicy_options INTERFACE -Werror)
 endif()
 
+# Linking the tests again takes most of the time of building after a change. Only programs are linked
+# by another linker: the libraries stay what they are elsewhere. It has to take members out of archives
+# in the order of the command line, as ld does, because some tests replace functions of the C library.
+if(SECPOLICY_LINKER)
+  include(CheckLinkerFlag)
+  set(linker_option -fuse-ld=${SECPOLICY_LINKER})
+  check_linker_flag(CXX ${linker_option} SECPOLICY_LINKS_WITH_${SECPOLICY_LINKER})
+  if(SECPOLICY_LINKS_WITH_${SECPOLICY_LINKER})
+    target_link_options(secpolicy_options INTERFACE
+      $<$<STREQUAL:$<TARGET_PROPERTY:TYPE>,EXECUTABLE>:${linker_option}>)
+  endif()
+endif()
+
 if(SECPOLICY_SANITIZE)
   # A finding ends the test that made it instead of being a line that nobody reads.
   target_compile_options(secpolicy_options INTERFACE
