@@ -21,7 +21,7 @@ enum class Door : std::uint8_t {
   kReadDirectory,  // readdir64
   kOpen,           // open
   kStatus,         // fstat
-  kOpenStream,     // fopen64, by which a file stream opens
+  kOpenStream,     // fopen or fopen64, by which a file stream opens
   kRead,           // read, of a file stream
   kMemory,         // operator new
 };

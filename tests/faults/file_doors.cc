@@ -56,6 +56,22 @@ void Remember(const DIR* directory, std::string_view path) {
 
 bool IsDot(std::string_view name) { return name == "." || name == ".."; }
 
+using OpenFunction = FILE*(const char* path, const char* mode);
+
+FILE* OpenStream(OpenFunction& real, const char* path, const char* mode) {
+  if (!IsWatched()) return real(path, mode);
+  Record(EventKind::kFile, "fopen", path);
+  const Verdict verdict = Pass(Door::kOpenStream);
+  if (verdict == Verdict::kFail) {
+    errno = EIO;
+    return nullptr;
+  }
+  FILE* const file = real(path, mode);
+  stream = {file == nullptr ? -1 : fileno(file),
+            verdict == Verdict::kFailGently ? 0 : SeenBytes(path)};
+  return file;
+}
+
 }  // namespace
 }  // namespace SecPolicyFaults
 
@@ -130,19 +146,15 @@ extern "C" int fstat(int descriptor, struct stat* status) noexcept {
   return real(descriptor, status);
 }
 
+// File streams open files by one or the other, as the C++ library was built.
+extern "C" FILE* fopen(const char* path, const char* mode) {
+  static auto* const real = Next<OpenFunction>("fopen");
+  return OpenStream(*real, path, mode);
+}
+
 extern "C" FILE* fopen64(const char* path, const char* mode) {
-  static auto* const real = Next<FILE*(const char*, const char*)>("fopen64");
-  if (!IsWatched()) return real(path, mode);
-  Record(EventKind::kFile, "fopen", path);
-  const Verdict verdict = Pass(Door::kOpenStream);
-  if (verdict == Verdict::kFail) {
-    errno = EIO;
-    return nullptr;
-  }
-  FILE* const file = real(path, mode);
-  stream = {file == nullptr ? -1 : fileno(file),
-            verdict == Verdict::kFailGently ? 0 : SeenBytes(path)};
-  return file;
+  static auto* const real = Next<OpenFunction>("fopen64");
+  return OpenStream(*real, path, mode);
 }
 
 extern "C" ssize_t read(int descriptor, void* buffer, size_t size) {
