@@ -3,11 +3,10 @@
 #include <algorithm>
 #include <limits>
 #include <nlohmann/json.hpp>
-#include <set>
 #include <string_view>
 
+#include "host/json/json_limits.h"
 #include "host/text/escaped.h"
-#include "host/text/quoted_name.h"
 #include "platform/tavon_strcat.h"
 #include "secpolicy/host/host_error.h"
 
@@ -21,46 +20,43 @@ namespace {
 // Refuses, while a document is parsed, what the parser itself would pass over.
 class ParseGuard {
  public:
-  explicit ParseGuard(const std::string& file) : file_(file) {}
+  explicit ParseGuard(const std::string& file) : limits_(file) {}
 
-  // Always true: nothing is left out of the document.
-  bool operator()(int depth, json::parse_event_t event, json& parsed) {
-    if (depth >= kDeepestNesting) {
-      throw HostError(
-          StrCat(file_, ": is nested more than ", kDeepestNesting, " arrays and objects deep"));
-    }
+  void Check(int depth, json::parse_event_t event, const json& parsed) {
+    limits_.Check(static_cast<std::size_t>(depth));
     if (event == json::parse_event_t::object_start) {
-      keys_.emplace_back();
+      limits_.BeginObject();
     } else if (event == json::parse_event_t::object_end) {
-      keys_.pop_back();
+      limits_.EndObject();
     } else if (event == json::parse_event_t::key) {
-      const auto& key = parsed.get_ref<const std::string&>();
-      if (!keys_.back().insert(key).second) {
-        throw HostError(
-            StrCat(file_, ": gives the member ", QuotedName(key), " of one object twice"));
-      }
+      limits_.Key(parsed.get_ref<const std::string&>());
     }
-    return true;
   }
 
  private:
-  const std::string& file_;
-  std::vector<std::set<std::string>> keys_;  // of the objects that are open
+  JsonLimits limits_;
 };
-
-// The line and column of the last of the first `bytes` bytes of `text`, as editors count them.
-std::string LineAndColumn(std::string_view text, std::size_t bytes) {
-  const std::string_view before = text.substr(0, bytes == 0 ? 0 : bytes - 1);
-  const auto lines = std::count(before.begin(), before.end(), '\n');
-  const std::size_t lineStart = before.rfind('\n') + 1;  // npos wraps to the first line's start
-  return StrCat(lines + 1, ":", before.size() - lineStart + 1);
-}
 
 // The parser's text behind `prefix`: without its own name for the error and its count of lines.
 std::string Cause(const json::exception& error, std::string_view prefix) {
   const std::string text = error.what();
   const std::size_t found = text.find(prefix);
   return Escaped(found == std::string::npos ? text : text.substr(found + prefix.size())).Text();
+}
+
+json Parsed(const std::string& text, const std::string& file,
+            const json::parser_callback_t& callback) {
+  // The parser's message for an empty text differs between its versions.
+  if (text.empty()) {
+    throw HostError(StrCat(file, ":1:1: syntax error: the file is empty"));
+  }
+  try {
+    return json::parse(text, callback);
+  } catch (const json::parse_error& error) {
+    FailAtByte(text, error.byte, file, Cause(error, ": "));
+  } catch (const json::out_of_range& error) {
+    throw HostError(StrCat(file, ": ", Cause(error, "] ")));
+  }
 }
 
 // Appends to `place` the place of `sought` within `value`; says whether it is there. Places are
@@ -87,29 +83,33 @@ bool FindPlace(const json& value, const json& sought, json::json_pointer& place)
 }  // namespace
 
 json ParseJson(const std::string& text, const std::string& file) {
-  // The parser's message for an empty text differs between its versions.
-  if (text.empty()) {
-    throw HostError(StrCat(file, ":1:1: syntax error: the file is empty"));
-  }
-  try {
-    ParseGuard guard(file);
-    return json::parse(text, [&guard](int depth, json::parse_event_t event, json& parsed) {
-      return guard(depth, event, parsed);
-    });
-  } catch (const json::parse_error& error) {
-    throw HostError(StrCat(file, ":", LineAndColumn(text, error.byte), ": ", Cause(error, ": ")));
-  } catch (const json::out_of_range& error) {
-    throw HostError(StrCat(file, ": ", Cause(error, "] ")));
-  }
+  ParseGuard guard(file);
+  return Parsed(text, file, [&guard](int depth, json::parse_event_t event, const json& parsed) {
+    guard.Check(depth, event, parsed);
+    return true;
+  });
+}
+
+void RequireJson(const std::string& text, const std::string& file) {
+  Parsed(text, file, [](int, json::parse_event_t, const json&) { return false; });
+}
+
+void FailAtByte(const std::string& text, std::size_t bytes, const std::string& file,
+                const std::string& what) {
+  const std::string_view before = std::string_view(text).substr(0, bytes == 0 ? 0 : bytes - 1);
+  const auto lines = std::count(before.begin(), before.end(), '\n');
+  const std::size_t lineStart = before.rfind('\n') + 1;  // npos wraps to the first line's start
+  throw HostError(StrCat(file, ":", lines + 1, ":", before.size() - lineStart + 1, ": ", what));
 }
 
 JsonCursor::JsonCursor(const json& document, std::string file)
-    : value_(&document),
-      document_(&document),
-      file_(std::make_shared<const std::string>(std::move(file))) {}
+    : JsonCursor(document, std::make_shared<const JsonOrigin>(JsonOrigin{std::move(file)})) {}
+
+JsonCursor::JsonCursor(const json& tree, std::shared_ptr<const JsonOrigin> origin)
+    : value_(&tree), tree_(&tree), origin_(std::move(origin)) {}
 
 JsonCursor::JsonCursor(const json& value, const JsonCursor& from)
-    : value_(&value), document_(from.document_), file_(from.file_) {}
+    : value_(&value), tree_(from.tree_), origin_(from.origin_) {}
 
 JsonCursor JsonCursor::Member(const std::string& key) const {
   const std::optional<JsonCursor> member = Find(key);
@@ -138,10 +138,14 @@ void JsonCursor::AllowOnly(std::initializer_list<const char*> keys) const {
   }
 }
 
-std::vector<JsonCursor> JsonCursor::Items() const {
+void JsonCursor::ExpectArray() const {
   if (!value_->is_array()) {
     Fail("must be an array");
   }
+}
+
+std::vector<JsonCursor> JsonCursor::Items() const {
+  ExpectArray();
   std::vector<JsonCursor> items;
   items.reserve(value_->size());
   for (const json& item : *value_) {
@@ -188,10 +192,10 @@ bool JsonCursor::IsString() const { return value_->is_string(); }
 
 void JsonCursor::Fail(const std::string& what) const {
   json::json_pointer place;
-  FindPlace(*document_, *value_, place);
+  FindPlace(*tree_, *value_, place);
   // Keys are from outside; a NUL in one would end the message.
-  const std::string text = Escaped(place.to_string()).Text();
-  throw HostError(StrCat(*file_, ": ", text.empty() ? "/" : text, ": ", what));
+  const std::string text = origin_->place() + Escaped(place.to_string()).Text();
+  throw HostError(StrCat(origin_->file, ": ", text.empty() ? "/" : text, ": ", what));
 }
 
 void ExpectFormat(const JsonCursor& document, std::uint64_t known) {
