@@ -46,7 +46,7 @@ class TemporaryFile {
 
   int LetEverybodyRead() { return ::fchmod(fd_.Get(), 0644) == 0 ? 0 : errno; }
 
-  int Fill(std::string_view text) {
+  int Append(std::string_view text) {
     while (!text.empty()) {
       const ssize_t written = ::write(fd_.Get(), text.data(), text.size());
       if (written < 0) {
@@ -57,8 +57,10 @@ class TemporaryFile {
       }
       text.remove_prefix(static_cast<std::size_t>(written));
     }
-    return ::fsync(fd_.Get()) == 0 ? 0 : errno;
+    return 0;
   }
+
+  int Sync() { return ::fsync(fd_.Get()) == 0 ? 0 : errno; }
 
   int TakeName(const std::string& finalName) {
     if (::renameat(dirFd_, name_.c_str(), dirFd_, finalName.c_str()) != 0) {
@@ -104,6 +106,23 @@ std::string ReadAll(int fd, const std::string& file) {
   return text;
 }
 
+TextReader ReaderOf(int fd, const std::string& file) {
+  return [fd, file](std::size_t offset, std::span<char> into) {
+    std::size_t size = 0;
+    while (size < into.size()) {
+      const ssize_t got =
+          ::pread(fd, into.data() + size, into.size() - size, static_cast<off_t>(offset + size));
+      if (got == 0) break;
+      if (got > 0) {
+        size += static_cast<std::size_t>(got);
+      } else if (errno != EINTR) {
+        throw SystemFailure(file, "read", errno);
+      }
+    }
+    return size;
+  };
+}
+
 UniqueFd OpenFileIfThere(const DirectoryRef& dir, const std::string& name) {
   const std::string file = dir.PathOf(name);
   // Without O_NONBLOCK a fifo of that name would hold the caller up for ever.
@@ -142,9 +161,13 @@ std::string ReadFile(const DirectoryRef& dir, const std::string& name) {
 
 namespace {
 
+TextWriter WriterOf(const std::string& text) {
+  return [&text](const TextSink& sink) { sink(text); };
+}
+
 // False when the name has to be free and is not.
 enum class Existing { kReplaced, kStays };
-bool PutFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
+bool PutFile(const DirectoryRef& dir, const std::string& name, const TextWriter& write,
              Writers writers, Readers readers, Existing existing) {
   const auto check = [&](int number) {
     if (number != 0) {
@@ -157,7 +180,8 @@ bool PutFile(const DirectoryRef& dir, const std::string& name, const std::string
   TemporaryFile file(directory.Get(), NameInTheMaking(name, writers));
   check(file.Make());
   if (readers == Readers::kEverybody) check(file.LetEverybodyRead());
-  check(file.Fill(text));
+  write([&](std::string_view part) { check(file.Append(part)); });
+  check(file.Sync());
   const bool isReplaced = existing == Existing::kReplaced;
   const int taken = isReplaced ? file.TakeName(name) : file.TakeFreeName(name);
   if (!isReplaced && taken == EEXIST) {
@@ -171,12 +195,17 @@ bool PutFile(const DirectoryRef& dir, const std::string& name, const std::string
 }  // namespace
 
 bool MakeFileIfMissing(const DirectoryRef& dir, const std::string& name, const std::string& text) {
-  return PutFile(dir, name, text, Writers::kSeveral, Readers::kByMask, Existing::kStays);
+  return PutFile(dir, name, WriterOf(text), Writers::kSeveral, Readers::kByMask, Existing::kStays);
 }
 
 void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
                  Writers writers, Readers readers) {
-  PutFile(dir, name, text, writers, readers, Existing::kReplaced);
+  ReplaceFile(dir, name, WriterOf(text), writers, readers);
+}
+
+void ReplaceFile(const DirectoryRef& dir, const std::string& name, const TextWriter& write,
+                 Writers writers, Readers readers) {
+  PutFile(dir, name, write, writers, readers, Existing::kReplaced);
 }
 
 }  // namespace StandIn

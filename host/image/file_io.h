@@ -7,6 +7,7 @@
 #include <string_view>
 
 #include "host/image/directory.h"
+#include "host/json/text_reader.h"
 
 namespace StandIn {
 
@@ -30,6 +31,10 @@ void ReadBlocks(int fd, const std::string& file,
 
 // The same as one text.
 std::string ReadAll(int fd, const std::string& file);
+
+// The same file, to be read as often as needed; `fd` must stay open meanwhile. The reader throws
+// the same error.
+TextReader ReaderOf(int fd, const std::string& file);
 
 // Who else may be replacing the same file.
 enum class Writers {
@@ -57,6 +62,11 @@ bool MakeFileIfMissing(const DirectoryRef& dir, const std::string& name, const s
 // nothing of the new one remains (except when the last step, syncing the directory, failed: the new
 // content has the name then, but may not survive a power failure).
 void ReplaceFile(const DirectoryRef& dir, const std::string& name, const std::string& text,
+                 Writers writers = Writers::kSeveral, Readers readers = Readers::kByMask);
+
+// As above with a text of which `write` hands one part after another to its sink. What `write`
+// throws, this throws; the old file is then untouched and nothing of the new one remains.
+void ReplaceFile(const DirectoryRef& dir, const std::string& name, const TextWriter& write,
                  Writers writers = Writers::kSeveral, Readers readers = Readers::kByMask);
 
 }  // namespace StandIn

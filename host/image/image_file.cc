@@ -45,11 +45,11 @@ std::optional<ImageIndex> ReadImage(const HostDirectory& host,
     const UniqueFd index = OpenFileIfThere(dir, kIndexFile);
     const bool isLast = attempt == kAttempts;
     if (index.IsOpen() || isLast || !HasRoot(dir)) {
-      const std::string text = index.IsOpen() ? ReadAll(index.Get(), dir.PathOf(kIndexFile)) : "";
       readRest();
       if (IsIndexOf(dir, index)) {
         if (!index.IsOpen()) return std::nullopt;
-        return ParseImageIndex(text, dir.PathOf(kIndexFile));
+        const std::string file = dir.PathOf(kIndexFile);
+        return ParseImageIndex(ReaderOf(index.Get(), file), file);
       }
       if (isLast) throw HostError(dir.path + ": was assembled again and again while it was read");
     }

@@ -1,10 +1,11 @@
 #include "host/image/image_index.h"
 
 #include <nlohmann/json.hpp>
+
 #include <unordered_set>
 
 #include "host/image/entry_path.h"
-#include "host/json/json_cursor.h"
+#include "host/json/json_stream.h"
 #include "host/json/json_writer.h"
 #include "host/text/quoted_name.h"
 
@@ -24,14 +25,22 @@ bool IsFileName(const std::string& name) {
 // Reads the archives one after another, refusing what another one has.
 class IndexReader {
  public:
+  // An archive without its paths.
   TardiskContent Read(const JsonCursor& place) {
     place.AllowOnly({"name", "paths"});
-    TardiskContent content;
-    content.name = ReadName(place.Member("name"));
-    for (const JsonCursor& path : place.Member("paths").Items()) {
-      content.paths.push_back(ReadPath(path));
+    place.Member("paths").ExpectArray();
+    return {ReadName(place.Member("name")), {}};
+  }
+
+  std::string ReadPath(const JsonCursor& place) {
+    std::string path = DecodeBytes(place);
+    if (!IsPathOfArchives(path)) {
+      place.Fail(QuotedName(path) + " is not a path that an archive can bring");
     }
-    return content;
+    if (!paths_.insert(path).second) {
+      place.Fail(QuotedName(path) + " stands twice");
+    }
+    return path;
   }
 
  private:
@@ -46,25 +55,12 @@ class IndexReader {
     return name;
   }
 
-  std::string ReadPath(const JsonCursor& place) {
-    std::string path = DecodeBytes(place);
-    if (!IsPathOfArchives(path)) {
-      place.Fail(QuotedName(path) + " is not a path that an archive can bring");
-    }
-    if (!paths_.insert(path).second) {
-      place.Fail(QuotedName(path) + " stands twice");
-    }
-    return path;
-  }
-
   std::unordered_set<std::string> names_;
   std::unordered_set<std::string> paths_;
 };
 
 }  // namespace
 
-// Not as a document tree, which would take several times the memory of the index, and needs more to
-// be destroyed.
 std::string FormatImageIndex(const ImageIndex& index) {
   JsonWriter writer;
   writer.Begin(JsonWriter::Kind::kObject);
@@ -73,7 +69,7 @@ std::string FormatImageIndex(const ImageIndex& index) {
     writer.Begin(JsonWriter::Kind::kObject);
     writer.Member("name", EncodeBytes(content.name));
     writer.Begin("paths", JsonWriter::Kind::kArray);
-    for (const std::string& path : content.paths) writer.Item(EncodeBytes(path));
+    for (const std::string& path : content.paths) writer.String(EncodeBytes(path));
     writer.End();
     writer.End();
   }
@@ -82,16 +78,27 @@ std::string FormatImageIndex(const ImageIndex& index) {
   return writer.Text();
 }
 
-ImageIndex ParseImageIndex(const std::string& text, const std::string& file) {
-  const nlohmann::json document = ParseJson(text, file);
-  const JsonCursor whole(document, file);
+// There may be millions of paths.
+ImageIndex ParseImageIndex(const TextReader& text, const std::string& file) {
+  IndexReader reader;
+  std::vector<std::vector<std::string>> paths;
+  const auto takePath = [&](const JsonCursor& place, std::span<const std::size_t> indexes) {
+    if (paths.size() <= indexes[0]) paths.resize(indexes[0] + 1);
+    paths[indexes[0]].push_back(reader.ReadPath(place));
+  };
+  const JsonDocument document = ParseJsonBut({{{"tardisks", "*", "paths"}, takePath}}, text, file);
+  const JsonCursor whole(document.Value(), file);
   whole.AllowOnly({"tardisks"});
   ImageIndex index;
-  IndexReader reader;
   for (const JsonCursor& place : whole.Member("tardisks").Items()) {
     index.tardisks.push_back(reader.Read(place));
   }
+  for (std::size_t i = 0; i < paths.size(); ++i) index.tardisks[i].paths = std::move(paths[i]);
   return index;
+}
+
+ImageIndex ParseImageIndex(const std::string& text, const std::string& file) {
+  return ParseImageIndex(ReaderOf(text), file);
 }
 
 }  // namespace StandIn

@@ -4,6 +4,8 @@
 #include <string>
 #include <vector>
 
+#include "host/json/text_reader.h"
+
 namespace StandIn {
 
 // Where the root file system has the archives themselves.
@@ -35,6 +37,7 @@ std::string FormatImageIndex(const ImageIndex& index);
 
 // Reads that again. Throws HostError "FILE:LINE:COLUMN: ..." or "FILE: PLACE: ..." for anything
 // else: other members, names and paths that Assemble would not write, and whatever stands twice.
+ImageIndex ParseImageIndex(const TextReader& text, const std::string& file);
 ImageIndex ParseImageIndex(const std::string& text, const std::string& file);
 
 }  // namespace StandIn

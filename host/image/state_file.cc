@@ -164,16 +164,25 @@ StateFile::Version StateFile::CurrentVersion() const {
   return VersionOf(status);
 }
 
-std::optional<std::string> StateFile::Read() {
+std::optional<TextReader> StateFile::Open() {
   Pin(OpenFileIfThere(dir_, kStateFile));
   if (!pinned_.IsOpen()) {
     return std::nullopt;
   }
-  return ReadAll(pinned_.Get(), dir_.PathOf(kStateFile));
+  return ReaderOf(pinned_.Get(), dir_.PathOf(kStateFile));
+}
+
+std::optional<std::string> StateFile::Read() {
+  const auto text = Open();
+  return text ? std::optional(WholeText(*text)) : std::nullopt;
 }
 
 void StateFile::Write(const std::string& text) {
-  ReplaceFile(dir_, kStateFile, text, Writers::kOne, Readers::kEverybody);
+  Write([&text](const TextSink& sink) { sink(text); });
+}
+
+void StateFile::Write(const TextWriter& write) {
+  ReplaceFile(dir_, kStateFile, write, Writers::kOne, Readers::kEverybody);
   Pin(UniqueFd(::openat(dir_.fd, kStateFile, O_PATH | O_CLOEXEC)));
 }
 

@@ -70,12 +70,16 @@ class StateFile {
     return CurrentVersion() != version;
   }
 
-  // The content; nothing when there is no file. Errors of ReadFileIfThere.
+  // The content, which stays readable until the next call of Open, Read or Write; nothing when
+  // there is no file. Errors of OpenFileIfThere.
+  [[nodiscard]] std::optional<TextReader> Open();
+  // The whole content. Errors of ReadFileIfThere.
   [[nodiscard]] std::optional<std::string> Read();
-  // The version of what Read returned or Write wrote last.
+  // The version of what Open or Read returned or Write wrote last.
   [[nodiscard]] const Version& LastVersion() const { return last_; }
 
   // Replaces the content. Errors of ReplaceFile.
+  void Write(const TextWriter& write);
   void Write(const std::string& text);
 
   // Removes the file, if it is there. Throws HostError "DIR/kernel.json: cannot be removed:

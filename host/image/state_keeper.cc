@@ -14,8 +14,8 @@ StateKeeper::StateKeeper(StateFile& file, std::string path, SimulatedModule& mod
 
 void StateKeeper::Refresh() {
   if (file_.CurrentVersion() == version_) return;
-  const auto text = file_.Read();
-  module_.Restore(text ? *text : initial_, path_);
+  const auto text = file_.Open();
+  module_.Restore(text ? *text : ReaderOf(initial_), path_);
   version_ = file_.LastVersion();
 }
 
@@ -52,7 +52,7 @@ void StateKeeper::Guarded(const Callable<void>& proceed) {
 
 void StateKeeper::Write() {
   try {
-    file_.Write(module_.Save());
+    file_.Write([this](const TextSink& sink) { module_.Save(sink); });
     version_ = file_.LastVersion();
   } catch (...) {
     // Back to what is kept.

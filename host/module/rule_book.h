@@ -18,6 +18,11 @@ class RuleBook {
   void Set(RuleKind kind, DomainId domain, const Rule& rule);
   [[nodiscard]] bool Holds(RuleKind kind, DomainId domain, const FewWords& words) const;
   [[nodiscard]] std::vector<Rule> Rules(RuleKind kind, DomainId domain) const;
+  // As RuleTable::ForEach.
+  template <typename Visit>
+  void ForEach(RuleKind kind, DomainId domain, Visit visit) const {
+    if (const RuleTable* const table = TableOf(kind, domain)) table->ForEach(visit);
+  }
 
   // How many transitions, of all domains, lead into the domain.
   [[nodiscard]] std::uint32_t TransitionsInto(DomainId domain) const;

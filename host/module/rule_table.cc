@@ -80,12 +80,13 @@ void RuleTable::DropTarget(DomainId target) {
 std::vector<Rule> RuleTable::Rules() const {
   std::vector<Rule> rules;
   rules.reserve(Size());
-  for (const Decided& decided : decided_) {
-    if (!decided.isHeld) continue;
-    const std::string_view words = std::string_view(text_).substr(decided.text, decided.size);
-    rules.push_back({decided.line, Separated(words), decided.target, decided.decision});
-  }
+  ForEach([&rules](Rule rule) { rules.push_back(std::move(rule)); });
   return rules;
+}
+
+Rule RuleTable::RuleOf(const Decided& decided) const {
+  const std::string_view words = std::string_view(text_).substr(decided.text, decided.size);
+  return {decided.line, Separated(words), decided.target, decided.decision};
 }
 
 // Gives back the room of what was dropped.

@@ -38,6 +38,14 @@ class RuleTable {
 
   [[nodiscard]] std::size_t Size() const { return index_.size(); }
   [[nodiscard]] std::vector<Rule> Rules() const;
+  // Hands one rule after another to `visit`: a million of them take several times the memory of the
+  // table.
+  template <typename Visit>
+  void ForEach(Visit visit) const {
+    for (const Decided& decided : decided_) {
+      if (decided.isHeld) visit(RuleOf(decided));
+    }
+  }
 
  private:
   // Where a decision stands in decided_.
@@ -73,6 +81,7 @@ class RuleTable {
   [[nodiscard]] std::string_view WordsAt(Place place) const {
     return std::string_view(text_).substr(decided_[place].text, decided_[place].size);
   }
+  [[nodiscard]] Rule RuleOf(const Decided& decided) const;
   std::optional<DomainId> SetLastWords(std::size_t text, const Rule& rule);
   void Compact();
 

@@ -32,10 +32,20 @@ SimulatedModule::SimulatedModule(ModuleDescription description, const ProcessTab
   }
 }
 
-std::string SimulatedModule::Save() const { return WriteState(*state_); }
+void SimulatedModule::Save(const TextSink& sink) const { WriteState(*state_, sink); }
+
+std::string SimulatedModule::Save() const {
+  std::string text;
+  Save([&text](std::string_view part) { text += part; });
+  return text;
+}
+
+void SimulatedModule::Restore(const TextReader& text, const std::string& file) {
+  state_ = ReadState(text, file, description_);
+}
 
 void SimulatedModule::Restore(const std::string& text, const std::string& file) {
-  state_ = ReadState(text, file, description_);
+  Restore(ReaderOf(text), file);
 }
 
 WorldId SimulatedModule::Self() const { return processes_.Self().pid; }

@@ -9,6 +9,7 @@
 #include <unordered_map>
 #include <vector>
 
+#include "host/json/text_reader.h"
 #include "host/module/module_description.h"
 #include "host/module/module_state.h"
 #include "host/module/process_table.h"
@@ -28,10 +29,12 @@ class SimulatedModule final : public SecurityModule {
   SimulatedModule(ModuleDescription description, const ProcessTable& processes);
 
   // What the module holds, as JSON text: the same for the same contents. state_json.h says its
-  // shape.
+  // shape. A sink gets it in parts of some 64 KiB, and may throw.
+  void Save(const TextSink& sink) const;
   [[nodiscard]] std::string Save() const;
   // Takes over what another module of a like description saved to `file`. HostError, and everything
   // is as it was, when `text` is not such or does not fit the description.
+  void Restore(const TextReader& text, const std::string& file);
   void Restore(const std::string& text, const std::string& file);
 
   std::optional<DomainId> FindDomain(const std::string& name) override;

@@ -32,18 +32,19 @@
 #include <memory>
 #include <string>
 
+#include "host/json/text_reader.h"
 #include "host/module/module_state.h"
 
 namespace StandIn {
 
-// The same text for the same contents.
-std::string WriteState(const ModuleState& state);
+// Hands the text over in parts: the same text for the same contents. Throws what `sink` throws.
+void WriteState(const ModuleState& state, const TextSink& sink);
 
 // What `text`, the content of `file`, says. Words of rules need not stand in the description's
 // lists; worlds of file rules need not be known; labels of files may have been removed; predefined
 // labels that are missing are defined. HostError with file and place for anything else that a
 // module of this description could not hold.
-std::unique_ptr<ModuleState> ReadState(const std::string& text, const std::string& file,
+std::unique_ptr<ModuleState> ReadState(const TextReader& text, const std::string& file,
                                        const ModuleDescription& description);
 
 }  // namespace StandIn

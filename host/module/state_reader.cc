@@ -1,8 +1,7 @@
 #include <limits>
-#include <nlohmann/json.hpp>
 #include <set>
 
-#include "host/json/json_cursor.h"
+#include "host/json/json_stream.h"
 #include "host/module/json_names.h"
 #include "host/module/module_error.h"
 #include "host/module/state_fields.h"
@@ -100,16 +99,20 @@ void ReadFileRule(const JsonCursor& place, std::uint32_t limit, FileRuleTable& t
   table.Set(rule);
 }
 
-void ReadAllRules(const JsonCursor& document, std::uint32_t fileRuleLimit, ModuleState& state) {
+// Refuses a member that is there and is no array.
+void ExpectArray(const JsonCursor& object, const char* key) {
+  if (const auto member = object.Find(key)) member->ExpectArray();
+}
+
+// The ids of the domains, in the order of the file. Their rules are not there yet.
+std::vector<DomainId> ReadDomainIds(const JsonCursor& document, const DomainTable& domains) {
+  std::vector<DomainId> ids;
   for (const JsonCursor& place : ItemsOf(document, "domains")) {
-    const DomainId domain = ReadDomainId(place.Member("id"), state.domains);
-    for (const JsonCursor& rule : ItemsOf(place, "rules")) {
-      ReadRule(rule, domain, state);
-    }
-    for (const JsonCursor& rule : ItemsOf(place, "fileRules")) {
-      ReadFileRule(rule, fileRuleLimit, state.fileRules[domain]);
-    }
+    ids.push_back(ReadDomainId(place.Member("id"), domains));
+    ExpectArray(place, "rules");
+    ExpectArray(place, "fileRules");
   }
+  return ids;
 }
 
 // ---- Roles, worlds and labels ----
@@ -191,36 +194,69 @@ void ReadLabels(const JsonCursor& document, std::uint32_t limit, ModuleState& st
   }
 }
 
-void ReadFileLabels(const JsonCursor& document, ModuleState& state) {
-  const LabelId next = state.labels[static_cast<std::size_t>(LabelType::kObject)].Held().next;
-  for (const JsonCursor& place : ItemsOf(document, "fileLabels")) {
-    const std::vector<JsonCursor> row = RowOf(place, 2);
-    const std::string path = ReadNonEmpty(row[0]);
-    const LabelId label = Read32(row[1], 1, kMost32);
-    if (label >= next) {
-      row[1].Fail(StrCat("no object label ever had the id ", label));
-    }
-    if (!state.fileLabels.emplace(path, label).second) {
-      row[0].Fail("is listed twice");
-    }
+void ReadFileLabel(const JsonCursor& place, LabelId next, ModuleState& state) {
+  const std::vector<JsonCursor> row = RowOf(place, 2);
+  const std::string path = ReadNonEmpty(row[0]);
+  const LabelId label = Read32(row[1], 1, kMost32);
+  if (label >= next) {
+    row[1].Fail(StrCat("no object label ever had the id ", label));
   }
+  if (!state.fileLabels.emplace(path, label).second) {
+    row[0].Fail("is listed twice");
+  }
+}
+
+// ---- The whole ----
+
+// There may be millions of rules and of labelled files. Rules need all domains, and the labels of
+// files all labels, wherever these are in the text: so it is read twice, without them and for them.
+std::vector<JsonArrays> Rows() {
+  return {{{"domains", "*", "rules"}}, {{"domains", "*", "fileRules"}}, {{"fileLabels"}}};
+}
+
+// All but the rows. Gives the ids of the domains in the order of the file.
+std::vector<DomainId> ReadHeads(const TextReader& text, const std::string& file,
+                                const ModuleDescription& description, ModuleState& state) {
+  const JsonDocument document = ParseJsonBut(Rows(), text, file);
+  const JsonCursor root(document.Value(), file);
+  ExpectFormat(root, kStateFormat);
+  root.AllowOnly({"format", "domains", "roles", "worlds", "labels", "fileLabels"});
+  ReadDomains(root, state.domains);
+  std::vector<DomainId> ids = ReadDomainIds(root, state.domains);
+  ReadRoles(root, state);
+  ReadWorlds(root, state);
+  ReadLabels(root, description.limits.labels, state);
+  ExpectArray(root, "fileLabels");
+  return ids;
+}
+
+void ReadRows(const TextReader& text, const std::string& file, std::uint32_t fileRuleLimit,
+              const std::vector<DomainId>& domains, ModuleState& state) {
+  const LabelId next = state.labels[static_cast<std::size_t>(LabelType::kObject)].Held().next;
+  const auto domainOf = [&](const JsonCursor& place, std::span<const std::size_t> indexes) {
+    if (indexes[0] >= domains.size()) place.Fail("was not there a moment ago");
+    return domains[indexes[0]];
+  };
+  std::vector<JsonArrays> rows = Rows();
+  rows[0].take = [&](const JsonCursor& row, std::span<const std::size_t> indexes) {
+    ReadRule(row, domainOf(row, indexes), state);
+  };
+  rows[1].take = [&](const JsonCursor& row, std::span<const std::size_t> indexes) {
+    ReadFileRule(row, fileRuleLimit, state.fileRules[domainOf(row, indexes)]);
+  };
+  rows[2].take = [&](const JsonCursor& row, std::span<const std::size_t>) {
+    ReadFileLabel(row, next, state);
+  };
+  ParseJsonBut(rows, text, file);
 }
 
 }  // namespace
 
-std::unique_ptr<ModuleState> ReadState(const std::string& text, const std::string& file,
+std::unique_ptr<ModuleState> ReadState(const TextReader& text, const std::string& file,
                                        const ModuleDescription& description) {
-  const nlohmann::json document = ParseJson(text, file);
-  const JsonCursor root(document, file);
-  ExpectFormat(root, kStateFormat);
-  root.AllowOnly({"format", "domains", "roles", "worlds", "labels", "fileLabels"});
   auto state = std::make_unique<ModuleState>(description);
-  ReadDomains(root, state->domains);
-  ReadAllRules(root, description.limits.fileRulesPerDomain, *state);
-  ReadRoles(root, *state);
-  ReadWorlds(root, *state);
-  ReadLabels(root, description.limits.labels, *state);
-  ReadFileLabels(root, *state);
+  const std::vector<DomainId> domains = ReadHeads(text, file, description, *state);
+  ReadRows(text, file, description.limits.fileRulesPerDomain, domains, *state);
   return state;
 }
 

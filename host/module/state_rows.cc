@@ -1,6 +1,5 @@
 #include "host/module/state_rows.h"
 
-#include <nlohmann/json.hpp>
 #include <optional>
 
 #include "host/module/json_names.h"
@@ -11,7 +10,6 @@
 
 namespace StandIn {
 
-using nlohmann::json;
 using Tavon::Misc::StrCat;
 
 namespace {
@@ -39,20 +37,26 @@ Decision ReadDecision(const JsonCursor& place) {
 
 }  // namespace
 
-json RuleRow(RuleKind kind, const Rule& rule) {
-  json row{InfoOf(kind).keyword, rule.line};
+void WriteRuleRow(JsonWriter& writer, RuleKind kind, const Rule& rule) {
+  writer.BeginLine(JsonWriter::Kind::kArray);
+  writer.String(InfoOf(kind).keyword);
+  writer.Number(rule.line);
   for (const std::string& word : rule.words) {
-    row.push_back(EncodeBytes(word));
+    writer.String(EncodeBytes(word));
   }
   if (kind == RuleKind::kTransition) {
-    row.push_back(rule.targetDomain);
+    writer.Number(rule.targetDomain);
   }
-  row.push_back(rule.decision == Decision::kGrant ? kGranted : kRevoked);
-  return row;
+  writer.String(rule.decision == Decision::kGrant ? kGranted : kRevoked);
+  writer.End();
 }
 
-json FileRuleRow(const FileRule& rule) {
-  return {rule.world, EncodeBytes(rule.path), PermissionLetters(rule.permission)};
+void WriteFileRuleRow(JsonWriter& writer, const FileRule& rule) {
+  writer.BeginLine(JsonWriter::Kind::kArray);
+  writer.Number(static_cast<std::uint64_t>(rule.world));
+  writer.String(EncodeBytes(rule.path));
+  writer.String(PermissionLetters(rule.permission));
+  writer.End();
 }
 
 std::pair<RuleKind, Rule> ReadRuleRow(const JsonCursor& place, const DomainTable& domains) {

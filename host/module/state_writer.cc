@@ -1,6 +1,6 @@
-#include "host/json/json_cursor.h"
-
 #include <nlohmann/json.hpp>
+
+#include "host/json/json_cursor.h"
 #include "host/json/json_writer.h"
 #include "host/module/json_names.h"
 #include "host/module/state_fields.h"
@@ -9,32 +9,31 @@
 
 namespace StandIn {
 
-using nlohmann::json;
-
 namespace {
 
 constexpr JsonWriter::Kind kObject = JsonWriter::Kind::kObject;
 constexpr JsonWriter::Kind kArray = JsonWriter::Kind::kArray;
 
-json Encoded(const std::vector<std::string>& names) {
-  json encoded = json::array();
+template <typename Names>
+void WriteNames(JsonWriter& writer, const char* key, const Names& names) {
+  writer.BeginLine(key, kArray);
   for (const std::string& name : names) {
-    encoded.push_back(EncodeBytes(name));
+    writer.String(EncodeBytes(name));
   }
-  return encoded;
+  writer.End();
 }
 
 void WriteRules(JsonWriter& writer, const RuleBook& book, DomainId domain) {
   bool begun = false;
   for (std::size_t i = 0; i < kRuleKinds; ++i) {
     const auto kind = static_cast<RuleKind>(i);
-    for (const Rule& rule : book.Rules(kind, domain)) {
+    book.ForEach(kind, domain, [&](const Rule& rule) {
       if (!begun) {
         writer.Begin("rules", kArray);
         begun = true;
       }
-      writer.Item(RuleRow(kind, rule));
-    }
+      WriteRuleRow(writer, kind, rule);
+    });
   }
   if (begun) {
     writer.End();
@@ -48,7 +47,7 @@ void WriteFileRules(JsonWriter& writer, const ModuleState& state, DomainId domai
   }
   writer.Begin("fileRules", kArray);
   for (const FileRule& rule : table->second.Rules()) {
-    writer.Item(FileRuleRow(rule));
+    WriteFileRuleRow(writer, rule);
   }
   writer.End();
 }
@@ -59,12 +58,15 @@ void WriteDomain(JsonWriter& writer, const ModuleState& state, DomainId id, cons
   writer.Member("name", EncodeBytes(domain.name));
   if (domain.origin == DomainOrigin::kRunTime) {
     writer.Member("origin", kOfRunTime);
-    writer.Member("maker", {{"pid", domain.maker.pid}, {"startTime", domain.maker.startTime}});
+    writer.BeginLine("maker", kObject);
+    writer.Member("pid", domain.maker.pid);
+    writer.Member("startTime", domain.maker.startTime);
+    writer.End();
   } else {
     writer.Member("origin", kOfPolicy);
   }
   if (!domain.services.empty()) {
-    writer.Member("services", Encoded(domain.services));
+    WriteNames(writer, "services", domain.services);
   }
   WriteRules(writer, state.rules, id);
   WriteFileRules(writer, state, id);
@@ -80,13 +82,13 @@ void WriteDomains(JsonWriter& writer, const ModuleState& state) {
 }
 
 void WriteRoles(JsonWriter& writer, const std::map<DomainRole, DomainId>& roles) {
-  json members = json::object();
+  writer.BeginLine("roles", kObject);
   for (const auto& [role, key] : kRoleKeys) {
     if (const auto domain = roles.find(role); domain != roles.end()) {
-      members[key] = domain->second;
+      writer.Member(key, domain->second);
     }
   }
-  writer.Member("roles", members);
+  writer.End();
 }
 
 void WriteLabels(JsonWriter& writer, const ModuleState& state) {
@@ -97,10 +99,13 @@ void WriteLabels(JsonWriter& writer, const ModuleState& state) {
     writer.Member("next", contents.next);
     writer.Begin("defined", kArray);
     for (const auto& [id, name] : contents.defined) {
-      writer.Item({id, EncodeBytes(name)});
+      writer.BeginLine(kArray);
+      writer.Number(id);
+      writer.String(EncodeBytes(name));
+      writer.End();
     }
     writer.End();
-    writer.Member("removed", Encoded({contents.removed.begin(), contents.removed.end()}));
+    WriteNames(writer, "removed", contents.removed);
     writer.End();
   }
   writer.End();
@@ -108,25 +113,31 @@ void WriteLabels(JsonWriter& writer, const ModuleState& state) {
 
 }  // namespace
 
-std::string WriteState(const ModuleState& state) {
-  JsonWriter writer;
+void WriteState(const ModuleState& state, const TextSink& sink) {
+  JsonWriter writer(sink);
   writer.Begin(kObject);
   writer.Member("format", kStateFormat);
   WriteDomains(writer, state);
   WriteRoles(writer, state.roles);
   writer.Begin("worlds", kArray);
   for (const auto& [world, domain] : state.worlds.Placed()) {
-    writer.Item({world, domain});
+    writer.BeginLine(kArray);
+    writer.Number(static_cast<std::uint64_t>(world));
+    writer.Number(domain);
+    writer.End();
   }
   writer.End();
   WriteLabels(writer, state);
   writer.Begin("fileLabels", kArray);
   for (const auto& [path, label] : state.fileLabels) {
-    writer.Item({EncodeBytes(path), label});
+    writer.BeginLine(kArray);
+    writer.String(EncodeBytes(path));
+    writer.Number(label);
+    writer.End();
   }
   writer.End();
   writer.End();
-  return writer.Text();
+  writer.Finish();
 }
 
 }  // namespace StandIn

@@ -6,6 +6,8 @@
 #include <sys/resource.h>
 #include <sys/stat.h>
 
+#include <array>
+
 #include "secpolicy/host/host_error.h"
 #include "tests/host/image/child_process.h"
 #include "tests/host/image/temporary_directory.h"
@@ -129,6 +131,45 @@ TEST_F(FileIoTest, AFullDiskKeepsTheOldFile) {
     GTEST_SKIP() << "this user may not mount a small file system";
   }
   EXPECT_EQ(result, ChildResult::kPassed);
+}
+
+TEST_F(FileIoTest, ATextMayComeInParts) {
+  ReplaceFile(Ref(), "f", [](const TextSink& sink) {
+    sink("one ");
+    sink("");
+    sink("two");
+  });
+  EXPECT_EQ(ReadBytes(Path("f")), "one two");
+}
+
+TEST_F(FileIoTest, ATextThatEndsHalfWayKeepsTheOldFile) {
+  WriteBytes(Path("f"), "old");
+  const TextWriter write = [](const TextSink& sink) {
+    sink("half of the new");
+    throw HostError("no more");
+  };
+  EXPECT_EQ(MessageOf<HostError>([&] { ReplaceFile(Ref(), "f", write); }), "no more");
+  EXPECT_EQ(ReadBytes(Path("f")), "old");
+  EXPECT_THAT(NamesIn(Path()), ElementsAre("f"));
+}
+
+TEST_F(FileIoTest, AFileIsReadFromAnyOffset) {
+  WriteBytes(Path("f"), "0123456789");
+  const UniqueFd fd = OpenFileIfThere(Ref(), "f");
+  const TextReader reader = ReaderOf(fd.Get(), "D/f");
+  std::array<char, 4> block{};
+  EXPECT_EQ(reader(3, block), 4U);
+  EXPECT_EQ(std::string_view(block.data(), 4), "3456");
+  EXPECT_EQ(reader(8, block), 2U);
+  EXPECT_EQ(reader(10, block), 0U);
+  EXPECT_EQ(WholeText(reader), "0123456789");
+}
+
+TEST_F(FileIoTest, AFileThatCannotBeReadIsNamed) {
+  const UniqueFd directory(::open(Path().c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  const TextReader reader = ReaderOf(directory.Get(), "D/f");
+  EXPECT_EQ(MessageOf<HostError>([&] { WholeText(reader); }),
+            "D/f: cannot be read: Is a directory");
 }
 
 TEST_F(FileIoTest, AVanishedDirectoryIsNamed) {

@@ -200,5 +200,41 @@ TEST_F(BadStateTest, Labels) {
             "kernel.json: /labels/objects: unknown member");
 }
 
+TEST_F(BadStateTest, EveryBeginningOfAStateIsRefused) {
+  Fill();
+  const std::string text = module_.Save();
+  for (std::size_t size = 0; size + 1 < text.size(); ++size) {  // the last byte is a line end
+    EXPECT_THAT(Refused(text.substr(0, size)), HasSubstr(": syntax error")) << size;
+  }
+}
+
+TEST_F(BadStateTest, MembersAreJudgedInWhicheverOrderTheyStand) {
+  const BadState rows[] = {
+      {R"({"fileLabels": [["/a", 3]], "format": 1})",
+       "/fileLabels/0/1: no object label ever had the id 3"},
+      {R"({"domains": [{"rules": [["-s", 1, "open", "deny"]], "origin": "policy", "name": "a",
+                        "id": 1}], "format": 1})",
+       "/domains/0/rules/0/3: must be \"grant\" or \"revoke\""},
+      {R"({"domains": [{"rules": [["-s", 1, "open", "deny"]], "fileLabels": 1}], "format": 2})",
+       "/format: format 2 is not known here, only format 1"},
+  };
+  for (const BadState& row : rows) {
+    EXPECT_EQ(Refused(row.text), "kernel.json: " + row.message);
+  }
+}
+
+TEST_F(BadStateTest, ATextThatGrowsWhileItIsRead) {
+  const std::string before = R"({"format": 1, "domains": []})";
+  const std::string after =
+      R"({"format": 1, "domains": [{"rules": [["-s", 1, "open", "grant"]]}]})";
+  int beginnings = 0;
+  const TextReader text = [&](std::size_t offset, std::span<char> into) {
+    beginnings += offset == 0 ? 1 : 0;
+    return ReaderOf(beginnings == 1 ? before : after)(offset, into);
+  };
+  EXPECT_EQ(HostErrorOf([&] { module_.Restore(text, "kernel.json"); }),
+            "kernel.json: /domains/0/rules/0: was not there a moment ago");
+}
+
 }  // namespace
 }  // namespace StandIn

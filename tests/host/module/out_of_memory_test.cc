@@ -100,5 +100,28 @@ TEST_F(OutOfMemoryTest, OperationIsDoneWhollyOrNotAtAll) {
   }
 }
 
+TEST_F(OutOfMemoryTest, RestoringIsDoneWhollyOrNotAtAll) {
+  SimulatedModule source = Filled();
+  source.CreateDomain(kName, DomainOrigin::kRunTime);
+  source.SetFileLabel("/a/path/that/is/longer/too", 1);
+  const std::string saved = source.Save();
+  SimulatedModule module = Filled();
+  const std::string before = Seen(module);
+  unsigned int allocation = 0;
+  for (;; ++allocation) {
+    FailAllocation(allocation);
+    try {
+      module.Restore(saved, "kernel.json");
+    } catch (const std::bad_alloc&) {
+    }
+    const bool failed = AllocationFailed();
+    FailNoAllocation();
+    if (!failed) break;
+    ASSERT_EQ(Seen(module), before) << "allocation " << allocation;
+  }
+  EXPECT_GT(allocation, 100U);
+  EXPECT_EQ(module.Save(), saved);
+}
+
 }  // namespace
 }  // namespace StandIn

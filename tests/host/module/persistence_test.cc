@@ -189,6 +189,28 @@ TEST_F(PersistenceTest, TheOrderOfDomainsInTheFileDoesNotMatter) {
   EXPECT_EQ(Make("b"), 2U);
 }
 
+TEST_F(PersistenceTest, TheOrderOfMembersInTheFileDoesNotMatter) {
+  module_.Restore(R"({"fileLabels": [["/a", 3]],
+    "labels": {"object": {"defined": [[3, "logs"]], "next": 4}},
+    "domains": [{"fileRules": [[0, "/a", "r"]], "rules": [["-s", 1, "open", "grant"]],
+                 "name": "a", "origin": "policy", "id": 1}],
+    "format": 1})",
+                  "kernel.json");
+  EXPECT_EQ(module_.FileLabel("/a"), 3U);
+  EXPECT_THAT(WordsOf(RuleKind::kSyscall, 1), ElementsAre("open"));
+  EXPECT_EQ(module_.CountFileRules(1), 1U);
+}
+
+TEST_F(PersistenceTest, AStateLongerThanABlockComesBackTheSame) {
+  const DomainId app = Make("app");
+  for (std::uint32_t i = 0; i < 10'000; ++i) {
+    Set(RuleKind::kCapabilityParam, app, {"net_bind", "parameter" + std::to_string(i)},
+        Decision::kGrant, i);
+  }
+  ASSERT_GT(module_.Save().size(), 400'000U);
+  ExpectTheSameText();
+}
+
 TEST_F(PersistenceTest, AModuleThatRefusedAFileGoesOnWorking) {
   Fill();
   EXPECT_NE(HostErrorOf([&] { module_.Restore("{", "kernel.json"); }), "(nothing was thrown)");
