@@ -169,13 +169,13 @@ class PreparedDomain {
 
   std::string name_;
   unsigned int id_;
-  Prepared<SecPolicy::ObjectAccessRuleType> objects_;
-  Prepared<SecPolicy::CapabilityRuleType> capabilities_;
-  Prepared<SecPolicy::DomTransRuleType> transitions_;
-  Prepared<SecPolicy::FileCreationRuleType> files_;
-  Prepared<SecPolicy::CapabilityParamRuleType> parameters_;
-  Prepared<SecPolicy::SyscallRuleType> systemCalls_;
-  Prepared<SecPolicy::UnixSockCreationRuleType> sockets_;
+  Prepared<ZekCtl::Security::ZekAccess_ObjectAccessRule> objects_;
+  Prepared<ZekCtl::Security::ZekAccess_CapabilityRule> capabilities_;
+  Prepared<ZekCtl::Security::ZekAccess_DomTransRule> transitions_;
+  Prepared<ZekCtl::Security::ZekAccess_FileCreationRule> files_;
+  Prepared<ZekCtl::Security::ZekAccess_CapabilityParamRule> parameters_;
+  Prepared<ZekCtl::Security::ZekAccess_SyscallRule> systemCalls_;
+  Prepared<ZekCtl::Security::ZekAccess_UnixSockCreationRule> sockets_;
 };
 
 void Module(benchmark::State& state) {

@@ -1,48 +1,55 @@
 #include "domain/domain_policy.h"
 
-#include <array>
+#include <tuple>
+#include <type_traits>
 #include <utility>
 
 #include "core/diagnostics.h"
 #include "core/rule_lines.h"
 #include "domain/file_path_access_rules.h"
 #include "domain/keyword_rules.h"
+#include "platform/rule_types.h"
 
 namespace SecPolicy {
 
+using namespace ZekCtl::Security;
 using Tavon::Lib::TavonException;
 
 namespace {
 
-template <typename Rules>
-std::unique_ptr<PolicyRules> Make() {
-  return std::make_unique<Rules>();
+// The class of a record's rule set. One that adds nothing to its family may do without a line here.
+template <typename Record>
+struct RuleSetOf : std::type_identity<KeywordRules<Record>> {};
+template <>
+struct RuleSetOf<ZekAccess_SyscallRule> : std::type_identity<SyscallRules> {};
+template <>
+struct RuleSetOf<ZekAccess_CapabilityRule> : std::type_identity<CapabilityRules> {};
+template <>
+struct RuleSetOf<ZekAccess_CapabilityParamRule> : std::type_identity<CapabilityParamRules> {};
+template <>
+struct RuleSetOf<ZekAccess_ObjectAccessRule> : std::type_identity<ObjectAccessRules> {};
+template <>
+struct RuleSetOf<ZekAccess_DomTransRule> : std::type_identity<DomTransRules> {};
+template <>
+struct RuleSetOf<ZekAccess_FileCreationRule> : std::type_identity<FileCreationRules> {};
+template <>
+struct RuleSetOf<ZekAccess_UnixSockCreationRule> : std::type_identity<UnixSockCreationRules> {};
+template <>
+struct RuleSetOf<ZekAccess_FilePathAccessRule> : std::type_identity<FilePathAccessRules> {};
+
+using RuleSets = std::map<std::string, std::unique_ptr<PolicyRules>>;
+
+template <typename Record>
+void AddRuleSet(const RuleRow<Record>& row, RuleSets& ruleSets) {
+  auto& ruleSet = ruleSets[row.info.keyword] = std::make_unique<typename RuleSetOf<Record>::type>();
+  ruleSet->SetKeyword(row.info.keyword);
 }
-
-struct RuleSetType {
-  const char* keyword;
-  std::unique_ptr<PolicyRules> (*make)();
-};
-
-constexpr std::array<RuleSetType, 8> kRuleSetTypes{{
-    {"-s", Make<SyscallRules>},
-    {"-c", Make<CapabilityRules>},
-    {"-p", Make<CapabilityParamRules>},
-    {"-a", Make<ObjectAccessRules>},
-    {"-d", Make<DomTransRules>},
-    {"-f", Make<FileCreationRules>},
-    {"-u", Make<UnixSockCreationRules>},
-    {"-r", Make<FilePathAccessRules>},
-}};
 
 }  // namespace
 
 DomainPolicy::DomainPolicy(std::string domainName, unsigned int domainId)
     : domainId_(domainId), domainName_(std::move(domainName)) {
-  for (const RuleSetType& type : kRuleSetTypes) {
-    auto& ruleSet = rules_[type.keyword] = type.make();
-    ruleSet->SetKeyword(type.keyword);
-  }
+  std::apply([&](const auto&... rows) { (AddRuleSet(rows, rules_), ...); }, kRuleRows);
 }
 
 void DomainPolicy::SetPolicyFile(std::string path) { policyFile_ = std::move(path); }
