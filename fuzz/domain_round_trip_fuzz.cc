@@ -16,8 +16,6 @@
 
 namespace {
 
-using StandIn::RuleKind;
-
 // A kernel of the small world, to which a domain's file is handed.
 class Kernel {
  public:
@@ -56,11 +54,11 @@ class Kernel {
   // Everything but the lines of the rules.
   std::string Held() {
     std::string text;
-    for (std::size_t kind = 0; kind < StandIn::kRuleKinds; ++kind) {
-      for (const StandIn::Rule& rule :
-           host_.Module().Rules(static_cast<RuleKind>(kind), Fuzz::kAppDomain)) {
-        text += std::to_string(kind) + Fuzz::Joined({rule.words.begin(), rule.words.end()}, "|") +
-                ">" + std::to_string(rule.targetDomain) +
+    for (const auto& info : ZekCtl::Security::kRuleTypes) {
+      if (!info.HasDecision()) continue;
+      for (const StandIn::Rule& rule : host_.Module().Rules(info.type, Fuzz::kAppDomain)) {
+        text += info.keyword + Fuzz::Joined({rule.words.begin(), rule.words.end()}, "|") + ">" +
+                std::to_string(rule.targetDomain) +
                 (rule.decision == StandIn::Decision::kGrant ? "+\n" : "-\n");
       }
     }

@@ -8,14 +8,14 @@
 namespace {
 
 using StandIn::LabelType;
-using StandIn::RuleKind;
+using StandIn::RuleType;
 
 void RequireRulesOf(StandIn::SecurityModule& module, StandIn::DomainId domain) {
-  for (std::size_t kind = 0; kind < StandIn::kRuleKinds; ++kind) {
-    for (const StandIn::Rule& rule : module.Rules(static_cast<RuleKind>(kind), domain)) {
-      Fuzz::Require(rule.words.size() == InfoOf(static_cast<RuleKind>(kind)).words,
-                    "a rule has the words of its kind");
-      if (static_cast<RuleKind>(kind) == RuleKind::kTransition) {
+  for (const auto& info : ZekCtl::Security::kRuleTypes) {
+    if (!info.HasDecision()) continue;
+    for (const StandIn::Rule& rule : module.Rules(info.type, domain)) {
+      Fuzz::Require(rule.words.size() == info.wordCount, "a rule has the words of its type");
+      if (info.type == RuleType::kTransition) {
         Fuzz::Require(module.GetDomainInfo(rule.targetDomain).has_value(), "a target exists");
       }
     }

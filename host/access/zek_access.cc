@@ -13,10 +13,6 @@ using namespace StandIn;
 
 namespace {
 
-// The numbers are the module's own.
-LabelType ToModule(ZekAccessLabelType type) { return static_cast<LabelType>(type); }
-WordList ToModule(ZekAccess_KeywordType type) { return static_cast<WordList>(type); }
-
 std::string NameOf(const AttachedHost& host, unsigned int domainId) {
   return host.unobserved.DomainName(domainId);
 }
@@ -25,13 +21,13 @@ template <typename Record>
 void SetRule(SecurityModule& module, Record record) {
   const DomainId domain = record.domainId;
   AsPlatform(
-      [&] { module.SetRule(RecordShape<Record>::kKind, domain, ToRule(std::move(record))); });
+      [&] { module.SetRule(kRuleRow<Record>.info.type, domain, ToRule(std::move(record))); });
 }
 
 template <typename Record>
 void GetRules(const AttachedHost& host, unsigned int domainId, std::list<Record>& records) {
   AsPlatform([&] {
-    std::vector<Rule> rules = host.module.Rules(RecordShape<Record>::kKind, domainId);
+    std::vector<Rule> rules = host.module.Rules(kRuleRow<Record>.info.type, domainId);
     const std::string name = NameOf(host, domainId);
     for (Rule& rule : rules) records.push_back(ToRecord<Record>(std::move(rule), domainId, name));
   });

@@ -9,13 +9,15 @@
 #include <utility>
 #include <vector>
 
+#include "platform/rule_types.h"
+
 namespace StandIn {
 
-// Up to three words, kept in place: a load makes one of these for each of its rules, and a vector
+// Up to kMost words, kept in place: a load makes one of these for each of its rules, and a vector
 // would take memory each time.
 class FewWords {
  public:
-  static constexpr std::size_t kMost = 3;
+  static constexpr std::size_t kMost = ZekCtl::Security::kMostRuleWords;
 
   FewWords() = default;
   FewWords(std::initializer_list<std::string> words) { Append(words); }

@@ -6,6 +6,7 @@
 #include <string>
 
 #include "host/module/few_words.h"
+#include "platform/rule_types.h"
 
 namespace StandIn {
 
@@ -15,43 +16,15 @@ using DomainId = std::uint32_t;
 using WorldId = std::int32_t;
 using LabelId = std::uint32_t;
 
-// The kinds of rules that consist of words and a decision.
-enum class RuleKind : std::uint8_t {
-  kObjectAccess,     // object, access
-  kCapability,       // capability
-  kTransition,       // label, target domain, event
-  kFileCreation,     // parent label, file label, file type
-  kCapabilityParam,  // capability, parameter
-  kSyscall,          // system call
-  kUnixSocket,       // label, socket type
-};
-inline constexpr std::size_t kRuleKinds = 7;
-
-// A rule kind's keyword in policy files and the number of its words, by RuleKind.
-struct RuleKindInfo {
-  const char* keyword;
-  std::size_t words;
-};
-inline constexpr std::array<RuleKindInfo, kRuleKinds> kRuleKindInfo{{
-    {"-a", 2},
-    {"-c", 1},
-    {"-d", 3},
-    {"-f", 3},
-    {"-p", 2},
-    {"-s", 1},
-    {"-u", 2},
-}};
-constexpr const RuleKindInfo& InfoOf(RuleKind kind) {
-  return kRuleKindInfo[static_cast<std::size_t>(kind)];
-}
+using ZekCtl::Security::RuleType;
 
 enum class Decision : std::uint8_t { kRevoke, kGrant };
 
-// One decision. The words are its key within a domain and kind.
+// One decision of a rule that ends in one. The words are its key within a domain and type.
 struct Rule {
   std::uint32_t line = 0;     // in the policy file; 0 when there is none
-  FewWords words;             // InfoOf(kind).words of them
-  DomainId targetDomain = 0;  // of transitions only
+  FewWords words;             // as many as InfoOf(type) says
+  DomainId targetDomain = 0;  // of types with a DomainWord() only: its id
   Decision decision = Decision::kRevoke;
 };
 

@@ -2,20 +2,14 @@
 
 namespace StandIn {
 
-namespace {
-
-constexpr std::size_t kTransitions = static_cast<std::size_t>(RuleKind::kTransition);
-
-}  // namespace
-
-const RuleTable* RuleBook::TableOf(RuleKind kind, DomainId domain) const {
+const RuleTable* RuleBook::TableOf(RuleType type, DomainId domain) const {
   const auto found = domains_.find(domain);
-  return found == domains_.end() ? nullptr : &found->second[static_cast<std::size_t>(kind)];
+  return found == domains_.end() ? nullptr : &found->second[static_cast<std::size_t>(type)];
 }
 
-void RuleBook::Set(RuleKind kind, DomainId domain, const Rule& rule) {
-  RuleTable& table = domains_[domain][static_cast<std::size_t>(kind)];
-  if (kind != RuleKind::kTransition) {
+void RuleBook::Set(RuleType type, DomainId domain, const Rule& rule) {
+  RuleTable& table = domains_[domain][static_cast<std::size_t>(type)];
+  if (!InfoOf(type).DomainWord()) {
     table.Set(rule);
     return;
   }
@@ -28,13 +22,13 @@ void RuleBook::Set(RuleKind kind, DomainId domain, const Rule& rule) {
   }
 }
 
-bool RuleBook::Holds(RuleKind kind, DomainId domain, const FewWords& words) const {
-  const RuleTable* const table = TableOf(kind, domain);
+bool RuleBook::Holds(RuleType type, DomainId domain, const FewWords& words) const {
+  const RuleTable* const table = TableOf(type, domain);
   return table != nullptr && table->Holds(words);
 }
 
-std::vector<Rule> RuleBook::Rules(RuleKind kind, DomainId domain) const {
-  const RuleTable* const table = TableOf(kind, domain);
+std::vector<Rule> RuleBook::Rules(RuleType type, DomainId domain) const {
+  const RuleTable* const table = TableOf(type, domain);
   return table == nullptr ? std::vector<Rule>() : table->Rules();
 }
 
@@ -44,15 +38,19 @@ std::uint32_t RuleBook::TransitionsInto(DomainId domain) const {
 }
 
 void RuleBook::ForgetDomain(DomainId domain) {
-  if (const RuleTable* const transitions = TableOf(RuleKind::kTransition, domain)) {
-    transitions->ForEachTarget([this](DomainId target) { --transitionsInto_[target]; });
+  for (const auto& info : ZekCtl::Security::kRuleTypes) {
+    const RuleTable* const rules = info.DomainWord() ? TableOf(info.type, domain) : nullptr;
+    if (rules == nullptr) continue;
+    rules->ForEachTarget([this](DomainId target) { --transitionsInto_[target]; });
   }
   domains_.erase(domain);
   if (TransitionsInto(domain) == 0) {
     return;
   }
   for (auto& [other, tables] : domains_) {
-    tables[kTransitions].DropTarget(domain);
+    for (const auto& info : ZekCtl::Security::kRuleTypes) {
+      if (info.DomainWord()) tables[static_cast<std::size_t>(info.type)].DropTarget(domain);
+    }
   }
   transitionsInto_.erase(domain);
 }

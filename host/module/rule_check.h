@@ -11,10 +11,10 @@
 
 namespace StandIn {
 
-// Throws ModuleError EINVAL unless the rule has as many words as its kind asks for, each of which
+// Throws ModuleError EINVAL unless the rule has as many words as its type asks for, each of which
 // stands in its list, as `validate` judges (by throwing), or is a name (a transition's target) or a
 // parameter, which must not be empty or hold a NUL.
-void CheckRuleWords(RuleKind kind, const Rule& rule,
+void CheckRuleWords(RuleType type, const Rule& rule,
                     const std::function<void(WordList, const std::string&)>& validate);
 
 // As SecurityModule::CheckCapabilityParams.

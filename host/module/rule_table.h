@@ -1,4 +1,4 @@
-// The rules of one domain and kind.
+// The rules of one domain and type.
 #pragma once
 
 #include <tsl/robin_set.h>

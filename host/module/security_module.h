@@ -27,6 +27,12 @@ enum class WordList : unsigned int {
   kSocketTypes = 7,
   kSyscalls = 8,
 };
+constexpr LabelType ToModule(ZekCtl::Security::ZekAccessLabelType type) {
+  return static_cast<LabelType>(type);
+}
+constexpr WordList ToModule(ZekCtl::Security::ZekAccess_KeywordType list) {
+  return static_cast<WordList>(list);
+}
 
 enum class DomainRole : std::uint8_t { kGlobalVM, kIoFilter };
 
@@ -83,12 +89,12 @@ class SecurityModule {
   virtual std::map<std::string, long> Words(WordList list) = 0;
 
   // ---- Rules ----
-  // One decision per domain, kind and words: a later one replaces an earlier one in its place.
+  // One decision per domain, type and words: a later one replaces an earlier one in its place.
   // ENOENT (the domain, or a transition's target), EINVAL (a word that its list rejects, an empty
   // parameter or target's name, or a wrong number of words).
-  virtual void SetRule(RuleKind kind, DomainId domain, const Rule& rule) = 0;
+  virtual void SetRule(RuleType type, DomainId domain, const Rule& rule) = 0;
   // In the order in which their words were first set. ENOENT.
-  virtual std::vector<Rule> Rules(RuleKind kind, DomainId domain) = 0;
+  virtual std::vector<Rule> Rules(RuleType type, DomainId domain) = 0;
   // EINVAL naming both lines when one capability and parameter is granted and revoked in `rules`.
   virtual void CheckCapabilityParams(const std::string& domainName,
                                      const std::vector<Rule>& rules) = 0;

@@ -19,7 +19,7 @@
 namespace StandIn {
 
 // Beside what SecurityModule says: slot 0 holds the predefined domain `rootDom`. A number that is
-// no label type, word list or kind of rule is refused with EINVAL. When memory runs out, a list
+// no label type, word list or type of rule is refused with EINVAL. When memory runs out, a list
 // that was to be added, removed or renamed is done in part; every other operation is not done at
 // all.
 class SimulatedModule final : public SecurityModule {
@@ -53,8 +53,8 @@ class SimulatedModule final : public SecurityModule {
   void ValidateWord(WordList list, const std::string& word) override;
   std::map<std::string, long> Words(WordList list) override;
 
-  void SetRule(RuleKind kind, DomainId domain, const Rule& rule) override;
-  std::vector<Rule> Rules(RuleKind kind, DomainId domain) override;
+  void SetRule(RuleType type, DomainId domain, const Rule& rule) override;
+  std::vector<Rule> Rules(RuleType type, DomainId domain) override;
   void CheckCapabilityParams(const std::string& domainName,
                              const std::vector<Rule>& rules) override;
 

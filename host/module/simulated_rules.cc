@@ -19,10 +19,13 @@ void RequireList(WordList list) {
   }
 }
 
-void RequireKind(RuleKind kind) {
-  if (static_cast<std::size_t>(kind) >= kRuleKinds) {
+void RequireDecision(RuleType type) {
+  if (static_cast<std::size_t>(type) >= ZekCtl::Security::kRuleTypes.size()) {
     throw ModuleError(EINVAL,
-                      StrCat("no kind of rules has the number ", static_cast<unsigned>(kind)));
+                      StrCat("no kind of rules has the number ", static_cast<unsigned>(type)));
+  }
+  if (!InfoOf(type).HasDecision()) {
+    throw ModuleError(EINVAL, StrCat("a rule \"", InfoOf(type).keyword, "\" has no decision"));
   }
 }
 
@@ -51,21 +54,19 @@ std::map<std::string, long> SimulatedModule::Words(WordList list) {
   return {WordsOf(list).begin(), WordsOf(list).end()};
 }
 
-void SimulatedModule::SetRule(RuleKind kind, DomainId domain, const Rule& rule) {
-  RequireKind(kind);
+void SimulatedModule::SetRule(RuleType type, DomainId domain, const Rule& rule) {
+  RequireDecision(type);
   state_->domains.Require(domain);
-  CheckRuleWords(kind, rule,
+  CheckRuleWords(type, rule,
                  [this](WordList list, const std::string& word) { ValidateWord(list, word); });
-  if (kind == RuleKind::kTransition) {
-    state_->domains.Require(rule.targetDomain);
-  }
-  state_->rules.Set(kind, domain, rule);
+  if (InfoOf(type).DomainWord()) state_->domains.Require(rule.targetDomain);
+  state_->rules.Set(type, domain, rule);
 }
 
-std::vector<Rule> SimulatedModule::Rules(RuleKind kind, DomainId domain) {
-  RequireKind(kind);
+std::vector<Rule> SimulatedModule::Rules(RuleType type, DomainId domain) {
+  RequireDecision(type);
   state_->domains.Require(domain);
-  return state_->rules.Rules(kind, domain);
+  return state_->rules.Rules(type, domain);
 }
 
 void SimulatedModule::CheckCapabilityParams(const std::string& domainName,

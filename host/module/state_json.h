@@ -9,7 +9,7 @@
 //         "origin": "policy",            or "runTime", which has a maker:
 //         "maker": {"pid": 812, "startTime": 99120},
 //         "services": ["console"],
-//         "rules": [                     keyword, line, words, decision; kind by kind, each in the
+//         "rules": [                     keyword, line, words, decision; type by type, each in the
 //           ["-s", 4, "open", "grant"],  order in which the words were first set
 //           ["-d", 5, "default", "utilDom", "exec", 2, "revoke"]      2: the target's id
 //         ],

@@ -81,11 +81,11 @@ void ReadDomains(const JsonCursor& document, DomainTable& domains) {
 // ---- Rules ----
 
 void ReadRule(const JsonCursor& place, DomainId domain, ModuleState& state) {
-  const auto [kind, rule] = ReadRuleRow(place, state.domains);
-  if (state.rules.Holds(kind, domain, rule.words)) {
+  const auto [type, rule] = ReadRuleRow(place, state.domains);
+  if (state.rules.Holds(type, domain, rule.words)) {
     place.Fail("the words of this rule are decided on already");
   }
-  state.rules.Set(kind, domain, rule);
+  state.rules.Set(type, domain, rule);
 }
 
 void ReadFileRule(const JsonCursor& place, std::uint32_t limit, FileRuleTable& table) {

@@ -17,13 +17,10 @@ namespace {
 constexpr char kGranted[] = "grant";
 constexpr char kRevoked[] = "revoke";
 
-RuleKind ReadRuleKind(const JsonCursor& place) {
+RuleType ReadRuleType(const JsonCursor& place) {
   const std::string keyword = place.String();
-  for (std::size_t i = 0; i < kRuleKinds; ++i) {
-    if (keyword == kRuleKindInfo[i].keyword) {
-      return static_cast<RuleKind>(i);
-    }
-  }
+  const auto type = ZekCtl::Security::TypeOfKeyword(keyword);
+  if (type && InfoOf(*type).HasDecision()) return *type;
   place.Fail("no kind of rules has the keyword " + QuotedName(keyword));
 }
 
@@ -37,14 +34,14 @@ Decision ReadDecision(const JsonCursor& place) {
 
 }  // namespace
 
-void WriteRuleRow(JsonWriter& writer, RuleKind kind, const Rule& rule) {
+void WriteRuleRow(JsonWriter& writer, RuleType type, const Rule& rule) {
   writer.BeginLine(JsonWriter::Kind::kArray);
-  writer.String(InfoOf(kind).keyword);
+  writer.String(InfoOf(type).keyword);
   writer.Number(rule.line);
   for (const std::string& word : rule.words) {
     writer.String(EncodeBytes(word));
   }
-  if (kind == RuleKind::kTransition) {
+  if (InfoOf(type).DomainWord()) {
     writer.Number(rule.targetDomain);
   }
   writer.String(rule.decision == Decision::kGrant ? kGranted : kRevoked);
@@ -59,14 +56,14 @@ void WriteFileRuleRow(JsonWriter& writer, const FileRule& rule) {
   writer.End();
 }
 
-std::pair<RuleKind, Rule> ReadRuleRow(const JsonCursor& place, const DomainTable& domains) {
+std::pair<RuleType, Rule> ReadRuleRow(const JsonCursor& place, const DomainTable& domains) {
   const std::vector<JsonCursor> start = place.Items();
   if (start.empty()) {
     place.Fail("must begin with the keyword of a kind of rules");
   }
-  const RuleKind kind = ReadRuleKind(start[0]);
-  const std::size_t words = InfoOf(kind).words;
-  const std::size_t targets = kind == RuleKind::kTransition ? 1 : 0;
+  const RuleType type = ReadRuleType(start[0]);
+  const std::size_t words = InfoOf(type).wordCount;
+  const std::size_t targets = InfoOf(type).DomainWord() ? 1 : 0;
   const std::vector<JsonCursor> row = RowOf(place, 2 + words + targets + 1);
   Rule rule;
   rule.line = Read32(row[1], 0, kMost32);
@@ -77,7 +74,7 @@ std::pair<RuleKind, Rule> ReadRuleRow(const JsonCursor& place, const DomainTable
     rule.targetDomain = ReadDomainId(row[2 + words], domains);
   }
   rule.decision = ReadDecision(row.back());
-  return {kind, std::move(rule)};
+  return {type, std::move(rule)};
 }
 
 FileRule ReadFileRuleRow(const JsonCursor& place) {

@@ -25,14 +25,13 @@ void WriteNames(JsonWriter& writer, const char* key, const Names& names) {
 
 void WriteRules(JsonWriter& writer, const RuleBook& book, DomainId domain) {
   bool begun = false;
-  for (std::size_t i = 0; i < kRuleKinds; ++i) {
-    const auto kind = static_cast<RuleKind>(i);
-    book.ForEach(kind, domain, [&](const Rule& rule) {
+  for (const auto& info : ZekCtl::Security::kRuleTypes) {
+    book.ForEach(info.type, domain, [&](const Rule& rule) {
       if (!begun) {
         writer.Begin("rules", kArray);
         begun = true;
       }
-      WriteRuleRow(writer, kind, rule);
+      WriteRuleRow(writer, info.type, rule);
     });
   }
   if (begun) {

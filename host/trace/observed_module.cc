@@ -20,7 +20,7 @@ std::string LabelWord(SecurityModule& module, LabelId label) try {
 
 std::string CapabilityParamWords(const std::vector<Rule>& rules) {
   std::string text;
-  for (const Rule& rule : rules) text += "; " + RuleWords(RuleKind::kCapabilityParam, rule);
+  for (const Rule& rule : rules) text += "; " + RuleWords(RuleType::kCapabilityParam, rule);
   return text;
 }
 
@@ -125,18 +125,18 @@ std::map<std::string, long> ObservedModule::Words(WordList list) {
       Operation::kWords, [&] { return WordListWord(list); }, [&] { return module_.Words(list); });
 }
 
-void ObservedModule::SetRule(RuleKind kind, DomainId domain, const Rule& rule) {
+void ObservedModule::SetRule(RuleType type, DomainId domain, const Rule& rule) {
   return point_.Pass(
       Operation::kSetRule,
-      [&] { return DomainWord(module_, domain) + " " + RuleWords(kind, rule); },
-      [&] { return module_.SetRule(kind, domain, rule); });
+      [&] { return DomainWord(module_, domain) + " " + RuleWords(type, rule); },
+      [&] { return module_.SetRule(type, domain, rule); });
 }
 
-std::vector<Rule> ObservedModule::Rules(RuleKind kind, DomainId domain) {
+std::vector<Rule> ObservedModule::Rules(RuleType type, DomainId domain) {
   return point_.Pass(
       Operation::kGetRules,
-      [&] { return DomainWord(module_, domain) + " " + InfoOf(kind).keyword; },
-      [&] { return module_.Rules(kind, domain); });
+      [&] { return DomainWord(module_, domain) + " " + InfoOf(type).keyword; },
+      [&] { return module_.Rules(type, domain); });
 }
 
 void ObservedModule::CheckCapabilityParams(const std::string& domainName,

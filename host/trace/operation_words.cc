@@ -22,13 +22,13 @@ std::string WordListWord(WordList list) {
   return index < kNames.size() ? kNames[index] : "list-" + std::to_string(index + 1);
 }
 
-std::string RuleWords(RuleKind kind, const Rule& rule) {
+std::string RuleWords(RuleType type, const Rule& rule) {
   std::string text =
-      std::string(InfoOf(kind).keyword) + " " + Join({rule.words.begin(), rule.words.end()});
+      std::string(InfoOf(type).keyword) + " " + Join({rule.words.begin(), rule.words.end()});
   text += rule.decision == Decision::kGrant ? " grant" : " revoke";
   std::string comment;
   if (rule.line != 0) comment += " line " + std::to_string(rule.line);
-  if (kind == RuleKind::kTransition) comment += " into " + std::to_string(rule.targetDomain);
+  if (InfoOf(type).DomainWord()) comment += " into " + std::to_string(rule.targetDomain);
   return comment.empty() ? text : text + " #" + comment;
 }
 

@@ -18,7 +18,7 @@ std::string LabelTypeWord(LabelType type);
 std::string WordListWord(WordList list);
 
 // The rule as a policy line: keyword, words, decision; then as a comment what a line does not show.
-std::string RuleWords(RuleKind kind, const Rule& rule);
+std::string RuleWords(RuleType type, const Rule& rule);
 
 // The letters of the permission bits, in the order "rwx"; then "+" and the
 // bits without a letter as a number.

@@ -18,7 +18,6 @@ namespace SecPolicyTest {
 
 using SecPolicy::ZekAccessInterfaceImpl;
 using StandIn::LabelType;
-using StandIn::RuleKind;
 
 namespace {
 
@@ -53,10 +52,10 @@ void CorpusKernel::Write(const std::string& text) {
 }
 
 void CorpusKernel::AddRules(std::vector<std::string>& records) {
-  for (std::size_t number = 0; number < StandIn::kRuleKinds; ++number) {
-    const auto kind = static_cast<RuleKind>(number);
-    for (const StandIn::Rule& rule : host_.Module().Rules(kind, kAppDomain)) {
-      records.push_back(RecordOf(kind, rule));
+  for (const auto& info : ZekCtl::Security::kRuleTypes) {
+    if (!info.HasDecision()) continue;
+    for (const StandIn::Rule& rule : host_.Module().Rules(info.type, kAppDomain)) {
+      records.push_back(RecordOf(info.type, rule));
     }
   }
 }

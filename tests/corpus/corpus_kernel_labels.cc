@@ -19,7 +19,7 @@ namespace SecPolicyTest {
 
 using SecPolicy::ZekAccessInterfaceImpl;
 using StandIn::LabelType;
-using StandIn::RuleKind;
+using StandIn::RuleType;
 
 namespace {
 
@@ -76,9 +76,9 @@ void CorpusKernel::SetExceptions(const std::string& file, std::vector<std::strin
     if (!RefusalOf([&] { rules.AddRule(entry.first, Held(), file, words, iface); }).empty()) break;
   }
   if (!RefusalOf([&] { rules.Set(iface); }).empty()) return;
-  const auto transitions = host_.Module().Rules(RuleKind::kTransition, 0);
+  const auto transitions = host_.Module().Rules(RuleType::kTransition, 0);
   for (const StandIn::Rule& rule : transitions) {
-    records.push_back(RecordOf(RuleKind::kTransition, rule));
+    records.push_back(RecordOf(RuleType::kTransition, rule));
   }
   // The first domain is there for good, and so are its rules.
   if (!transitions.empty()) host_.Module().Restore(fresh_, "kernel.json");

@@ -4,7 +4,7 @@
 
 namespace SecPolicyTest {
 
-using StandIn::RuleKind;
+using StandIn::RuleType;
 
 std::string WithFileMark(std::string text, const std::string& path) {
   for (std::size_t at = 0; (at = text.find(path, at)) != std::string::npos;) {
@@ -13,14 +13,14 @@ std::string WithFileMark(std::string text, const std::string& path) {
   return text;
 }
 
-std::string RecordOf(RuleKind kind, const StandIn::Rule& rule) {
+std::string RecordOf(RuleType type, const StandIn::Rule& rule) {
   std::string record;
   for (std::size_t i = 0; i < rule.words.size(); ++i) {
     record += "|" + rule.words[i];
-    if (kind == RuleKind::kTransition && i == 1) record += "=" + std::to_string(rule.targetDomain);
+    if (type == RuleType::kTransition && i == 1) record += "=" + std::to_string(rule.targetDomain);
   }
   record += rule.decision == StandIn::Decision::kGrant ? "|grant" : "|revoke";
-  return std::to_string(rule.line) + " " + InfoOf(kind).keyword + record;
+  return std::to_string(rule.line) + " " + InfoOf(type).keyword + record;
 }
 
 }  // namespace SecPolicyTest

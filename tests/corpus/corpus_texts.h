@@ -14,6 +14,6 @@ inline const std::string kFirstLabel(60, '~');
 std::string WithFileMark(std::string text, const std::string& path);
 
 // A rule as the kernel holds it: line, keyword, words, a target's id, decision.
-std::string RecordOf(StandIn::RuleKind kind, const StandIn::Rule& rule);
+std::string RecordOf(StandIn::RuleType type, const StandIn::Rule& rule);
 
 }  // namespace SecPolicyTest

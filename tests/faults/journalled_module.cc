@@ -30,8 +30,8 @@ void JournalledModule::ValidateWord(WordList list, const std::string& word) {
 
 std::map<std::string, long> JournalledModule::Words(WordList list) { return module_.Words(list); }
 
-std::vector<Rule> JournalledModule::Rules(RuleKind kind, DomainId domain) {
-  return module_.Rules(kind, domain);
+std::vector<Rule> JournalledModule::Rules(RuleType type, DomainId domain) {
+  return module_.Rules(type, domain);
 }
 
 void JournalledModule::CheckCapabilityParams(const std::string& domainName,
@@ -107,10 +107,10 @@ void JournalledModule::PlaceWorld(WorldId world, DomainId domain) {
   });
 }
 
-void JournalledModule::SetRule(RuleKind kind, DomainId domain, const Rule& rule) {
-  module_.SetRule(kind, domain, rule);
+void JournalledModule::SetRule(RuleType type, DomainId domain, const Rule& rule) {
+  module_.SetRule(type, domain, rule);
   Remember([&] {
-    return [kind, domain, rule](SecurityModule& module) { module.SetRule(kind, domain, rule); };
+    return [type, domain, rule](SecurityModule& module) { module.SetRule(type, domain, rule); };
   });
 }
 

@@ -31,8 +31,8 @@ class JournalledModule final : public SecurityModule {
   void PlaceWorld(WorldId world, DomainId domain) override;
   void ValidateWord(WordList list, const std::string& word) override;
   std::map<std::string, long> Words(WordList list) override;
-  void SetRule(RuleKind kind, DomainId domain, const Rule& rule) override;
-  std::vector<Rule> Rules(RuleKind kind, DomainId domain) override;
+  void SetRule(RuleType type, DomainId domain, const Rule& rule) override;
+  std::vector<Rule> Rules(RuleType type, DomainId domain) override;
   void CheckCapabilityParams(const std::string& domainName,
                              const std::vector<Rule>& rules) override;
   std::vector<std::string> InvalidLabels(LabelType type) override;

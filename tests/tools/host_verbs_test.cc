@@ -189,7 +189,7 @@ TEST_F(HostVerbsTest, InfoOfALoadedHost) {
   EXPECT_EQ(Done({"host", "info", Host()}).out,
             "Host: " + Host() + "\n" + kLimits +
                 "Image: 1 tardisks\n  base.tar: 2 paths\nObjects: 3\nDomains:\n"
-                "  0 rootDom: -d 1\n  1 appDom: -a 1 -s 2 -r 1\n"
+                "  0 rootDom: -d 1\n  1 appDom: -a 1 -r 1 -s 2\n"
                 "  2 globalVMDom: no rules\n  3 ioFilterDom: no rules\n");
 }
 

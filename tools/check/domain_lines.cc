@@ -73,11 +73,11 @@ void DomainFile::CheckLine(const PolicyLine& line) {
   }
   const RuleTypeInfo& info = InfoOf(*type);
   const std::size_t count = line.words.size() - 1;
-  const std::size_t most = info.words.size() + 1;
-  if (count > most || count < (info.kind ? most : most - 1)) {
+  const std::size_t most = info.wordCount + 1;
+  if (count > most || count < (info.HasDecision() ? most : most - 1)) {
     Refuse(Kind::kWordCount, line, SpotOf(file_, line), TextOfRefusal(SecPolicy::RuleSizeError),
            HelpForCount(info));
-  } else if (info.kind) {
+  } else if (info.HasDecision()) {
     CheckKeywordRule(line, *type);
   } else {
     CheckPathRule(line);
@@ -88,10 +88,10 @@ void DomainFile::CheckKeywordRule(const PolicyLine& line, RuleType type) {
   const RuleTypeInfo& info = InfoOf(type);
   bool isGood = true;
   std::string words;
-  for (std::size_t i = 0; i < info.words.size(); ++i) {
+  for (std::size_t i = 0; i < info.wordCount; ++i) {
     const LineWord& word = line.words[i + 1];
-    const bool isTarget = type == RuleType::kTransition && i == 1;
-    isGood &= isTarget ? CheckTarget(line, word) : CheckWord(line, word, info.words[i]);
+    const RuleWordInfo& wordInfo = info.Words()[i];
+    isGood &= wordInfo.isDomain ? CheckTarget(line, word) : CheckWord(line, word, wordInfo);
     words += word.text + " ";
   }
   isGood &= CheckDecision(line);
@@ -105,12 +105,13 @@ void DomainFile::CheckKeywordRule(const PolicyLine& line, RuleType type) {
 
 bool DomainFile::CheckWord(const PolicyLine& line, const LineWord& word, const RuleWordInfo& info) {
   if (!info.list) return true;
-  if (*info.list == StandIn::WordList::kObjects) context_.references.objects.insert(word.text);
+  const StandIn::WordList list = StandIn::ToModule(*info.list);
+  if (list == StandIn::WordList::kObjects) context_.references.objects.insert(word.text);
   const auto refusal =
-      context_.judge.Refusal(*info.list, word.text, isRefused_ ? Effort::kBounded : Effort::kExact);
+      context_.judge.Refusal(list, word.text, isRefused_ ? Effort::kBounded : Effort::kExact);
   if (!refusal) return true;
   return Refuse(Kind::kUnknownWord, line, SpotOf(file_, line, word), *refusal,
-                context_.judge.HelpFor(*info.list, *refusal));
+                context_.judge.HelpFor(list, *refusal));
 }
 
 bool DomainFile::CheckTarget(const PolicyLine& line, const LineWord& word) {

@@ -8,13 +8,13 @@ namespace SecPolicyTool {
 
 std::string HelpForCount(const RuleTypeInfo& info) {
   std::string form = std::string("write: ") + info.keyword;
-  for (const RuleWordInfo& word : info.words) {
+  for (const RuleWordInfo& word : info.Words()) {
     form += " ";
     for (const char* c = word.name; *c != '\0'; ++c) {
       form += *c == ' ' || *c == '\'' ? '-' : static_cast<char>(std::toupper(*c));
     }
   }
-  return form + (info.kind ? " grant|revoke" : " [r][w][x]");
+  return form + (info.HasDecision() ? " grant|revoke" : " [r][w][x]");
 }
 
 std::string HelpForType(const std::string& word) {
@@ -27,7 +27,7 @@ std::string HelpForType(const std::string& word) {
   if (TypeOfKeyword("-" + letters)) return "did you mean \"-" + letters + "\"?";
   if (letters == "e") return "-E stands in the policy files of tardisks";
   std::string help = "the rule types are";
-  for (const RuleTypeInfo& info : RuleTypes()) help += std::string(" ") + info.keyword;
+  for (const RuleTypeInfo& info : kRuleTypes) help += std::string(" ") + info.keyword;
   return help;
 }
 

@@ -10,9 +10,9 @@ using namespace StandIn;
 
 namespace {
 
-PolicyRule ToPolicyRule(RuleKind kind, const Rule& rule) {
+PolicyRule ToPolicyRule(RuleType type, const Rule& rule) {
   PolicyRule held;
-  held.key = {TypeOf(kind), {rule.words.begin(), rule.words.end()}, 0};
+  held.key = {type, {rule.words.begin(), rule.words.end()}, 0};
   held.isGranted = rule.decision == Decision::kGrant;
   if (rule.line != 0) held.place = Place{"", rule.line, 0};
   return held;
@@ -27,10 +27,10 @@ PolicyRule ToPolicyRule(const FileRule& rule) {
 
 std::vector<PolicyRule> RulesOf(SecurityModule& module, DomainId domain) {
   std::vector<PolicyRule> rules;
-  for (const RuleTypeInfo& type : RuleTypes()) {
-    if (type.kind) {
-      for (const Rule& rule : module.Rules(*type.kind, domain)) {
-        rules.push_back(ToPolicyRule(*type.kind, rule));
+  for (const RuleTypeInfo& info : kRuleTypes) {
+    if (info.HasDecision()) {
+      for (const Rule& rule : module.Rules(info.type, domain)) {
+        rules.push_back(ToPolicyRule(info.type, rule));
       }
     } else {
       for (const FileRule& rule : module.FileRules(domain)) rules.push_back(ToPolicyRule(rule));

@@ -1,7 +1,6 @@
 // What a policy means, as far as it can be compared and asked: a value, wherever it was read.
 #pragma once
 
-#include <array>
 #include <cstdint>
 #include <map>
 #include <optional>
@@ -11,6 +10,7 @@
 
 #include "host/module/rule.h"
 #include "host/module/security_module.h"
+#include "platform/rule_types.h"
 
 namespace SecPolicyTool {
 
@@ -23,42 +23,13 @@ struct Place {
   bool operator==(const Place&) const = default;
 };
 
-// The eight types of rules, in the byte order of their keywords.
-enum class RuleType : std::uint8_t {
-  kObjectAccess,
-  kCapability,
-  kTransition,
-  kFileCreation,
-  kCapabilityParam,
-  kPath,
-  kSyscall,
-  kUnixSocket,
-};
+using ZekCtl::Security::kRuleTypes;
+using ZekCtl::Security::RuleType;
+using ZekCtl::Security::RuleTypeInfo;
+using ZekCtl::Security::RuleWordInfo;
+using ZekCtl::Security::TypeOfKeyword;
 
-// A word of a rule's line.
-struct RuleWordInfo {
-  const char* name;  // what a person calls it
-  // The list that must hold it; nothing for free words and names of domains.
-  std::optional<StandIn::WordList> list;
-};
-
-struct RuleTypeInfo {
-  const char* keyword;
-  const char* name;  // what a person calls such a rule
-  // Nothing for path rules, which have no decision but a permission.
-  std::optional<StandIn::RuleKind> kind;
-  // The words between keyword and decision, or permission.
-  std::vector<RuleWordInfo> words;
-};
-
-// All types, by RuleType.
-const std::array<RuleTypeInfo, 8>& RuleTypes();
-const RuleTypeInfo& InfoOf(RuleType type);
-RuleType TypeOf(StandIn::RuleKind kind);
-// Nothing for a keyword that is none.
-std::optional<RuleType> TypeOfKeyword(const std::string& keyword);
-
-// What a domain's rule decides on: its key. The words are those of RuleTypeInfo.
+// What a domain's rule decides on: its key. The words are those of its RuleTypeInfo.
 struct RuleKey {
   RuleType type = RuleType::kSyscall;
   std::vector<std::string> words;

@@ -17,31 +17,27 @@ using Words = std::vector<std::string>;
 
 namespace {
 
-// An operation, which together with the number of its words says which rules decide.
-struct Operation {
-  const char* word;
-  RuleType type;
-  std::vector<std::size_t> positions;  // where the words of the rule's key stand in the question
-  const char* form;
-};
+constexpr std::size_t kMostQuestionWords = ZekCtl::Security::kMostRuleWords + 1;
 
-const std::array<Operation, 6>& Operations() {
-  static const std::array<Operation, 6> kOperations{{
-      {"syscall", RuleType::kSyscall, {1}, "syscall NAME"},
-      {"capability", RuleType::kCapability, {1}, "capability NAME"},
-      {"capability", RuleType::kCapabilityParam, {1, 2}, "capability NAME PARAM"},
-      {"create", RuleType::kFileCreation, {2, 3, 1}, "create TYPE PARENT LABEL"},
-      {"socket", RuleType::kUnixSocket, {2, 1}, "socket TYPE LABEL"},
-      {"transition", RuleType::kTransition, {2, 3, 1}, "transition EVENT LABEL TARGET"},
-  }};
-  return kOperations;
+// The rule type that a question asks for is found by its operation and the number of its words.
+bool HasOperation(const RuleTypeInfo& info, const std::string& word) {
+  return info.operation != nullptr && word == info.operation;
 }
 
-// Any other operation is an access to what has a label.
-const Operation& AccessOperation() {
-  static const Operation kAccess{nullptr, RuleType::kObjectAccess, {1, 0}, "ACCESS LABEL"};
-  return kAccess;
+// The form of a question: "create TYPE PARENT LABEL".
+std::string FormOf(const RuleTypeInfo& info) {
+  std::array<std::string, kMostQuestionWords> parts{info.operation == nullptr ? ""
+                                                                              : info.operation};
+  for (const RuleWordInfo& word : info.Words()) parts.at(word.questionPosition) = word.questionWord;
+  std::string form;
+  for (const std::string& part : parts) {
+    if (!part.empty()) form += (form.empty() ? "" : " ") + part;
+  }
+  return form;
 }
+
+// Any operation that no type claims is an access to a label.
+constexpr RuleType kOtherOperations = RuleType::kObjectAccess;
 
 struct PathOperation {
   const char* word;
@@ -51,8 +47,9 @@ constexpr std::array<PathOperation, 3> kPathOperations{
     {{"read", 0x1}, {"write", 0x2}, {"exec", 0x10}}};
 
 bool IsPathQuestion(const Words& words) {
-  const bool isNamed = std::any_of(Operations().begin(), Operations().end(),
-                                   [&](const Operation& each) { return words[0] == each.word; });
+  const bool isNamed =
+      std::any_of(kRuleTypes.begin(), kRuleTypes.end(),
+                  [&](const RuleTypeInfo& info) { return HasOperation(info, words[0]); });
   return !isNamed && words.size() == 2 && words[1].starts_with('/');
 }
 
@@ -68,16 +65,16 @@ std::uint32_t PathPermission(const std::string& word) {
              " on a path; there are read, write and exec");
 }
 
-// The operation that the words mean, unless it is one on a path.
-const Operation& OperationOf(const Words& words) {
+// The type that the words ask for, unless they ask for a path.
+RuleType TypeAskedFor(const Words& words) {
   std::string forms;
-  for (const Operation& each : Operations()) {
-    if (words[0] != each.word) continue;
-    if (words.size() == each.positions.size() + 1) return each;
-    forms += (forms.empty() ? "" : " or ") + std::string(each.form);
+  for (const RuleTypeInfo& info : kRuleTypes) {
+    if (!HasOperation(info, words[0])) continue;
+    if (words.size() == info.wordCount + 1) return info.type;
+    forms += (forms.empty() ? "" : " or ") + FormOf(info);
   }
   if (!forms.empty()) RefuseForm(words[0] + " takes other words: " + forms);
-  return AccessOperation();
+  return kOtherOperations;
 }
 
 bool Holds(const Words& list, const std::string& word) {
@@ -86,24 +83,26 @@ bool Holds(const Words& list, const std::string& word) {
 
 // " (nearest: OPERATION)": what is no access was perhaps to be one of the others.
 std::string NearestText(const std::string& word, Words known) {
-  for (const Operation& each : Operations()) known.emplace_back(each.word);
+  for (const RuleTypeInfo& info : kRuleTypes) {
+    if (info.operation != nullptr) known.emplace_back(info.operation);
+  }
   const auto nearest = StandIn::NearestWord(word, known);
   return nearest && *nearest != word ? " (nearest: " + Escaped(*nearest).Text() + ")" : "";
 }
 
 // What is wrong with the word for that place of a rule; nothing when it will do.
-std::optional<std::string> ProblemOf(const std::string& word, std::size_t position, RuleType type,
-                                     const RuleWordInfo& info, const Vocabulary& vocabulary) {
-  if (!info.list) {
-    const bool isDomain = type == RuleType::kTransition;
-    if (!isDomain || Holds(vocabulary.domains, word)) return std::nullopt;
+std::optional<std::string> ProblemOf(const std::string& word, const RuleWordInfo& info,
+                                     const Vocabulary& vocabulary) {
+  if (info.isDomain && !Holds(vocabulary.domains, word)) {
     return UnknownWordText("domain", word, vocabulary.domains);
   }
-  const Words& list = vocabulary.lists.at(*info.list);
+  if (!info.list) return std::nullopt;
+  const StandIn::WordList which = StandIn::ToModule(*info.list);
+  const Words& list = vocabulary.lists.at(which);
   if (Holds(list, word)) return std::nullopt;
-  return position == 0
+  return info.questionPosition == 0
              ? "unknown operation \"" + Escaped(word).Text() + "\"" + NearestText(word, list)
-             : StandIn::UnknownWordText(*info.list, word, list);
+             : StandIn::UnknownWordText(which, word, list);
 }
 
 }  // namespace
@@ -113,8 +112,7 @@ void CheckForm(const Words& words) {
     PathPermission(words[0]);
     return;
   }
-  const bool isNamed = OperationOf(words).word != nullptr;
-  if (!isNamed && words.size() != 2) {
+  if (TypeAskedFor(words) == kOtherOperations && words.size() != 2) {
     RefuseForm(Escaped(words[0]).Text() + " is no operation with " +
                std::to_string(words.size() - 1) + " words" + NearestText(words[0], {}));
   }
@@ -126,15 +124,12 @@ Question ParseQuestion(const Words& words, const Vocabulary& vocabulary,
   if (IsPathQuestion(words)) {
     return {{RuleType::kPath, {NormalPath(resolve(words[1]))}, 0}, PathPermission(words[0])};
   }
-  const Operation& operation = OperationOf(words);
-  const RuleTypeInfo& type = InfoOf(operation.type);
-  RuleKey key{operation.type, {}, 0};
-  std::array<std::optional<std::string>, 4> problems;
-  for (std::size_t i = 0; i < type.words.size(); ++i) {
-    const std::size_t position = operation.positions[i];
-    key.words.push_back(words[position]);
-    problems.at(position) =
-        ProblemOf(words[position], position, operation.type, type.words[i], vocabulary);
+  RuleKey key{TypeAskedFor(words), {}, 0};
+  std::array<std::optional<std::string>, kMostQuestionWords> problems;
+  for (const RuleWordInfo& info : InfoOf(key.type).Words()) {
+    const std::string& word = words[info.questionPosition];
+    key.words.push_back(word);
+    problems.at(info.questionPosition) = ProblemOf(word, info, vocabulary);
   }
   for (std::size_t position = 0; position < problems.size(); ++position) {
     const auto& problem = problems.at(position);
@@ -144,9 +139,10 @@ Question ParseQuestion(const Words& words, const Vocabulary& vocabulary,
 }
 
 std::string QuestionForms() {
-  std::string forms = "  read|write|exec PATH\n  ";
-  forms += AccessOperation().form;
-  for (const Operation& each : Operations()) forms += std::string("\n  ") + each.form;
+  std::string forms = "  read|write|exec PATH";
+  for (const RuleTypeInfo& info : kRuleTypes) {
+    if (info.HasDecision()) forms += "\n  " + FormOf(info);
+  }
   return forms;
 }
 

@@ -17,10 +17,10 @@ void AddPlaceJson(const std::optional<Place>& place, json& entry) {
 }
 
 json RuleJson(const PolicyRule& rule) {
-  const bool isPath = rule.key.type == RuleType::kPath;
-  json entry{{"type", InfoOf(rule.key.type).keyword},
+  const RuleTypeInfo& info = InfoOf(rule.key.type);
+  json entry{{"type", info.keyword},
              {"words", rule.key.words},
-             {isPath ? "permission" : "decision", DecisionOf(rule)},
+             {info.HasDecision() ? "decision" : "permission", DecisionOf(rule)},
              {"line", LineOf(rule)}};
   if (rule.key.world != 0) entry["world"] = rule.key.world;
   AddPlaceJson(rule.place, entry);

@@ -1,7 +1,6 @@
 #include "tools/query/search.h"
 
 #include <algorithm>
-#include <array>
 #include <map>
 
 #include "tools/query/paths.h"
@@ -9,10 +8,6 @@
 namespace SecPolicyTool {
 
 namespace {
-
-// By RuleType.
-constexpr std::array<const char*, 8> kShortNames{"access", "capability", "transition", "create",
-                                                 "param",  "path",       "syscall",    "socket"};
 
 // The path rules of a domain that decide on a path, by their world.
 using Deciding = std::map<StandIn::WorldId, const PolicyRule*>;
@@ -30,7 +25,7 @@ Deciding DecidingOn(const std::string& path, const DomainContent& domain) {
 }
 
 bool Grants(const PolicyRule& rule) {
-  return rule.key.type == RuleType::kPath ? rule.permission != 0 : rule.isGranted;
+  return InfoOf(rule.key.type).HasDecision() ? rule.isGranted : rule.permission != 0;
 }
 
 bool SpeaksOf(const PolicyRule& rule, const std::string& path, const Deciding& deciding) {
@@ -71,12 +66,10 @@ TerminalText FoundText(const FoundRule& found) {
 }
 
 std::optional<RuleType> TypeNamed(const std::string& name) {
-  for (std::size_t i = 0; i < kShortNames.size(); ++i) {
-    const auto type = static_cast<RuleType>(i);
-    const std::string keyword = InfoOf(type).keyword;
-    if (name == keyword || "-" + name == keyword || name == InfoOf(type).name ||
-        name == kShortNames.at(i)) {
-      return type;
+  for (const RuleTypeInfo& info : kRuleTypes) {
+    if (name == info.keyword || "-" + name == info.keyword || name == info.name ||
+        name == info.shortName) {
+      return info.type;
     }
   }
   return std::nullopt;

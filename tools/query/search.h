@@ -36,8 +36,8 @@ std::vector<FoundRule> Search(const Policy& policy, const SearchTerms& terms);
 // "FILE:LINE: RULE", or "DOMAIN: RULE" when its file is not known.
 TerminalText FoundText(const FoundRule& found);
 
-// The type that a person means: by its keyword, with or without the "-"; by its name; or by the
-// word that is used for it in questions. Nothing for anything else.
+// The type that a person means: by its keyword, with or without the "-"; by its name; or by
+// its short name. Nothing for anything else.
 std::optional<RuleType> TypeNamed(const std::string& name);
 
 }  // namespace SecPolicyTool

@@ -22,8 +22,8 @@ Html RuleLine(const Anchors& anchors, const PolicyRule& rule) {
   Html line = InfoOf(rule.key.type).keyword;
   for (std::size_t word = 0; word < rule.key.words.size(); ++word) {
     const std::string& text = rule.key.words[word];
-    const bool isTarget = rule.key.type == RuleType::kTransition && word == 1;
-    line += " " + (isTarget                       ? anchors.Domain(text)
+    const bool isDomain = InfoOf(rule.key.type).DomainWord() == word;
+    line += " " + (isDomain                       ? anchors.Domain(text)
                    : IsLabel(rule.key.type, word) ? anchors.Label(text)
                                                   : Html(text));
   }
@@ -35,7 +35,7 @@ Html RuleLine(const Anchors& anchors, const PolicyRule& rule) {
 
 // What takes something away is set apart.
 bool IsRefusal(const PolicyRule& rule) {
-  return rule.key.type == RuleType::kPath ? rule.permission == 0 : !rule.isGranted;
+  return InfoOf(rule.key.type).HasDecision() ? !rule.isGranted : rule.permission == 0;
 }
 
 Html RuleHtml(const Anchors& anchors, const PolicyRule& rule, const std::string& file) {
@@ -60,9 +60,8 @@ Html GroupHtml(const Anchors& anchors, RuleType type, const std::vector<const Po
 // A count for each type of rule, in columns; types without a rule leave theirs empty.
 Html CountsHtml(const RulesByType& rules) {
   Html counts;
-  for (std::size_t i = 0; i < RuleTypes().size(); ++i) {
-    const auto found = rules.find(static_cast<RuleType>(i));
-    const RuleTypeInfo& info = RuleTypes().at(i);
+  for (const RuleTypeInfo& info : kRuleTypes) {
+    const auto found = rules.find(info.type);
     if (found == rules.end()) {
       counts += Element("i", {});
       continue;

@@ -13,7 +13,7 @@ Html LinkTo(const std::string& id, const std::string& name) {
 }  // namespace
 
 bool IsLabel(RuleType type, std::size_t word) {
-  return InfoOf(type).words.at(word).list == StandIn::WordList::kObjects;
+  return InfoOf(type).Words()[word].list == ZekCtl::Security::kObjectKeyword;
 }
 
 Anchors::Anchors(const Policy& policy, const TransitionGraph& graph) : graph_(graph) {

@@ -42,11 +42,10 @@ void PrintDomain(SimulatedModule& module, DomainId domain) {
     if (count != 0) line += " " + keyword + " " + std::to_string(count);
     rules += count;
   };
-  for (std::size_t kind = 0; kind < kRuleKinds; ++kind) {
-    const auto ruleKind = static_cast<RuleKind>(kind);
-    add(InfoOf(ruleKind).keyword, module.Rules(ruleKind, domain).size());
+  for (const auto& type : ZekCtl::Security::kRuleTypes) {
+    add(type.keyword, type.HasDecision() ? module.Rules(type.type, domain).size()
+                                         : module.CountFileRules(domain));
   }
-  add("-r", module.CountFileRules(domain));
   PrintLine(std::cout, rules == 0 ? line + " no rules" : line);
 }
 

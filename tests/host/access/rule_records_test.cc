@@ -120,7 +120,7 @@ TEST_F(RuleRecordTest, FileRulesAreReadAsLetters) {
 
 TEST_F(RuleRecordTest, ReadersAppend) {
   const DomainId id = Make("netDom");
-  Set(RuleKind::kSyscall, id, {"open"});
+  Set(RuleType::kSyscall, id, {"open"});
   AddFileRules(id, {{0, "/etc/a", 0x1}});
   ZekAccessInterfaceImpl iface;
   std::list<ZekAccess_SyscallRule> rules(1);

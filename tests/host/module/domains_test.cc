@@ -134,11 +134,11 @@ TEST_F(ModuleTest, ATransitionGivenAnotherTargetIsCountedThere) {
   const DomainId a = Make("a");
   const DomainId b = Make("b");
   const std::vector<std::string> words{"default", "a", "exec"};
-  module_.SetRule(RuleKind::kTransition, 0, {1, words, a, Decision::kGrant});
-  module_.SetRule(RuleKind::kTransition, 0, {2, words, b, Decision::kGrant});
+  module_.SetRule(RuleType::kTransition, 0, {1, words, a, Decision::kGrant});
+  module_.SetRule(RuleType::kTransition, 0, {2, words, b, Decision::kGrant});
   EXPECT_EQ(module_.GetDomainInfo(a)->refCount, 0U);
   EXPECT_EQ(module_.GetDomainInfo(b)->refCount, 1U);
-  EXPECT_EQ(module_.Rules(RuleKind::kTransition, 0)[0].targetDomain, b);
+  EXPECT_EQ(module_.Rules(RuleType::kTransition, 0)[0].targetDomain, b);
 }
 
 TEST_F(ModuleTest, ALeakedDomainIsARunTimeOneWithoutWorldsWhoseMakerEnded) {
@@ -175,7 +175,7 @@ TEST_F(ModuleTest, AnythingOfADestroyedDomainIsUnknownToTheNextInItsSlot) {
   const std::string before = module_.Save();
   module_.AddService(app, "console");
   module_.SetDomainRole(DomainRole::kIoFilter, app);
-  Set(RuleKind::kSyscall, app, {"open"});
+  Set(RuleType::kSyscall, app, {"open"});
   SetTransition(0, "default", "appDom");
   AddFileRules(app, {{0, "/a", 1}});
   EXPECT_NE(module_.Save(), before);

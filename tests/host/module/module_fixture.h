@@ -85,20 +85,20 @@ class ModuleTest : public testing::Test {
   DomainId MakeAtRunTime(const std::string& name) {
     return module_.CreateDomain(name, DomainOrigin::kRunTime);
   }
-  void Set(RuleKind kind, DomainId domain, const std::vector<std::string>& words,
+  void Set(RuleType type, DomainId domain, const std::vector<std::string>& words,
            Decision decision = Decision::kGrant, std::uint32_t line = 1) {
-    module_.SetRule(kind, domain, {line, words, 0, decision});
+    module_.SetRule(type, domain, {line, words, 0, decision});
   }
   void SetTransition(DomainId from, const std::string& label, const std::string& target,
                      std::uint32_t line = 1) {
     const auto id = module_.FindDomain(target);
-    module_.SetRule(RuleKind::kTransition, from,
+    module_.SetRule(RuleType::kTransition, from,
                     {line, {label, target, "exec"}, id.value(), Decision::kGrant});
   }
   // The words of each rule, in order, joined by blanks.
-  std::vector<std::string> WordsOf(RuleKind kind, DomainId domain) {
+  std::vector<std::string> WordsOf(RuleType type, DomainId domain) {
     std::vector<std::string> all;
-    for (const Rule& rule : module_.Rules(kind, domain)) {
+    for (const Rule& rule : module_.Rules(type, domain)) {
       std::string words;
       for (const std::string& word : rule.words) {
         words += (words.empty() ? "" : " ") + word;

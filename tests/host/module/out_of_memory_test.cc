@@ -28,11 +28,11 @@ const Change kChanges[] = {
     {"world", [](auto& module) { module.PlaceWorld(4711, kADom); }},
     {"rule",
      [](auto& module) {
-       module.SetRule(RuleKind::kCapabilityParam, kADom, {5, {"ipc_lock", kName}});
+       module.SetRule(RuleType::kCapabilityParam, kADom, {5, {"ipc_lock", kName}});
      }},
     {"transition",
      [](auto& module) {
-       module.SetRule(RuleKind::kTransition, kADom, {6, {"default", kName, "exec"}, kADom});
+       module.SetRule(RuleType::kTransition, kADom, {6, {"default", kName, "exec"}, kADom});
      }},
     {"label", [](auto& module) { module.AddLabels({kName}, LabelType::kObject); }},
     {"obsolete label", [](auto& module) { module.RemoveLabels({"old"}, LabelType::kObject); }},
@@ -56,8 +56,8 @@ class OutOfMemoryTest : public testing::Test {
     SimulatedModule module(ReadDescription(DefaultDescriptionText(), "host.json"), processes_);
     module.CreateDomain("aDom", DomainOrigin::kPolicy);
     module.CreateDomain("bDom", DomainOrigin::kPolicy);
-    module.SetRule(RuleKind::kTransition, kADom, {1, {"default", "bDom", "exec"}, kBDom});
-    module.SetRule(RuleKind::kTransition, kBDom, {2, {"default", "aDom", "exec"}, kADom});
+    module.SetRule(RuleType::kTransition, kADom, {1, {"default", "bDom", "exec"}, kBDom});
+    module.SetRule(RuleType::kTransition, kBDom, {2, {"default", "aDom", "exec"}, kADom});
     module.AddLabels({"old"}, LabelType::kObject);
     std::uint32_t taken = 0;
     module.AddFileRules(kADom, {{0, "/old", 1}, {0, "/there", 2}}, taken);

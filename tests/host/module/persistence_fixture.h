@@ -40,13 +40,13 @@ class PersistenceTest : public ModuleTest {
 
   void FillRules(DomainId app) {
     SetTransition(0, "default", "app%Dom \xff\x80", 4294967295U);
-    Set(RuleKind::kSyscall, app, {"read"}, Decision::kGrant, 4);
-    Set(RuleKind::kSyscall, app, {"open"}, Decision::kRevoke, 5);
-    Set(RuleKind::kObjectAccess, app, {"l\xc3\xa4", "read"}, Decision::kGrant, 0);
-    Set(RuleKind::kCapability, app, {"sys_boot"});
-    Set(RuleKind::kCapabilityParam, app, {"net_bind", "\x01\xff 80%"});
-    Set(RuleKind::kFileCreation, app, {"default", "tardisk", "dir"});
-    Set(RuleKind::kUnixSocket, app, {"default", "stream"});
+    Set(RuleType::kSyscall, app, {"read"}, Decision::kGrant, 4);
+    Set(RuleType::kSyscall, app, {"open"}, Decision::kRevoke, 5);
+    Set(RuleType::kObjectAccess, app, {"l\xc3\xa4", "read"}, Decision::kGrant, 0);
+    Set(RuleType::kCapability, app, {"sys_boot"});
+    Set(RuleType::kCapabilityParam, app, {"net_bind", "\x01\xff 80%"});
+    Set(RuleType::kFileCreation, app, {"default", "tardisk", "dir"});
+    Set(RuleType::kUnixSocket, app, {"default", "stream"});
   }
 
   SimulatedModule copy_{ReadDescription(kDescription, "host.json"), processes_};

@@ -95,8 +95,8 @@ TEST_F(PersistenceTest, ARestoredModuleAnswersAsTheSavedOne) {
   EXPECT_EQ(copy.FindDomain("app%Dom \xff\x80"), 1U);
   EXPECT_EQ(copy.WorldDomain(9), 3U);
   EXPECT_EQ(copy.GetDomainInfo(1)->refCount, 2U) << "a world and a transition";
-  EXPECT_EQ(copy.Rules(RuleKind::kTransition, 0)[0].targetDomain, 1U);
-  EXPECT_EQ(copy.Rules(RuleKind::kSyscall, 1)[1].decision, Decision::kRevoke);
+  EXPECT_EQ(copy.Rules(RuleType::kTransition, 0)[0].targetDomain, 1U);
+  EXPECT_EQ(copy.Rules(RuleType::kSyscall, 1)[1].decision, Decision::kRevoke);
   EXPECT_EQ(copy.FileRules(1)[1].path, "/a\x81");
   EXPECT_EQ(copy.LabelName(3, kObject), "l\xc3\xa4");
   EXPECT_EQ(copy.FileLabel("/b\xfe"), 5U);
@@ -158,7 +158,7 @@ TEST_F(PersistenceTest, WordsThatLeftTheirListsAreKept) {
   const std::string text = R"({"format": 1, "domains": [{"id": 0, "name": "rootDom",
     "origin": "policy", "rules": [["-s", 1, "vanished", "grant"]]}]})";
   module_.Restore(text, "kernel.json");
-  EXPECT_THAT(WordsOf(RuleKind::kSyscall, 0), ElementsAre("vanished"));
+  EXPECT_THAT(WordsOf(RuleType::kSyscall, 0), ElementsAre("vanished"));
 }
 
 TEST_F(PersistenceTest, APredefinedLabelThatIsMissingIsDefined) {

@@ -1,4 +1,4 @@
-// The rules of one domain and kind, by themselves.
+// The rules of one domain and type, by themselves.
 #include "host/module/rule_table.h"
 
 #include <gmock/gmock.h>

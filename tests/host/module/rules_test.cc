@@ -76,87 +76,87 @@ TEST(SimulatedModule, AListThatTheDescriptionLacksIsEmpty) {
 TEST_F(ModuleTest, EveryKindOfRuleComesBackAsItWasSet) {
   const DomainId app = Make("appDom");
   struct Row {
-    RuleKind kind;
+    RuleType type;
     std::vector<std::string> words;
   };
   const Row rows[] = {
-      {RuleKind::kObjectAccess, {"default", "read"}},
-      {RuleKind::kCapability, {"sys_boot"}},
-      {RuleKind::kTransition, {"tardisk", "appDom", "exec"}},
-      {RuleKind::kFileCreation, {"default", "tardisk", "dir"}},
-      {RuleKind::kCapabilityParam, {"net_bind", "any thing: 80 \xff"}},
-      {RuleKind::kSyscall, {"open"}},
-      {RuleKind::kUnixSocket, {"default", "stream"}},
+      {RuleType::kObjectAccess, {"default", "read"}},
+      {RuleType::kCapability, {"sys_boot"}},
+      {RuleType::kTransition, {"tardisk", "appDom", "exec"}},
+      {RuleType::kFileCreation, {"default", "tardisk", "dir"}},
+      {RuleType::kCapabilityParam, {"net_bind", "any thing: 80 \xff"}},
+      {RuleType::kSyscall, {"open"}},
+      {RuleType::kUnixSocket, {"default", "stream"}},
   };
   for (const Row& row : rows) {
-    module_.SetRule(row.kind, 0, {7, row.words, app, Decision::kGrant});
-    const std::vector<Rule> rules = module_.Rules(row.kind, 0);
+    module_.SetRule(row.type, 0, {7, row.words, app, Decision::kGrant});
+    const std::vector<Rule> rules = module_.Rules(row.type, 0);
     ASSERT_EQ(rules.size(), 1U) << row.words[0];
     EXPECT_EQ(rules[0].line, 7U);
     EXPECT_EQ(rules[0].words, row.words);
     EXPECT_EQ(rules[0].decision, Decision::kGrant);
-    EXPECT_THAT(module_.Rules(row.kind, app), IsEmpty()) << "another domain";
+    EXPECT_THAT(module_.Rules(row.type, app), IsEmpty()) << "another domain";
   }
-  EXPECT_EQ(module_.Rules(RuleKind::kTransition, 0)[0].targetDomain, app);
+  EXPECT_EQ(module_.Rules(RuleType::kTransition, 0)[0].targetDomain, app);
 }
 
 TEST_F(ModuleTest, TheLaterOfTwoDecisionsWinsInThePlaceOfTheFirst) {
-  Set(RuleKind::kSyscall, 0, {"open"}, Decision::kGrant, 1);
-  Set(RuleKind::kSyscall, 0, {"read"}, Decision::kGrant, 2);
-  Set(RuleKind::kSyscall, 0, {"open"}, Decision::kRevoke, 3);
-  const std::vector<Rule> rules = module_.Rules(RuleKind::kSyscall, 0);
-  EXPECT_THAT(WordsOf(RuleKind::kSyscall, 0), ElementsAre("open", "read"));
+  Set(RuleType::kSyscall, 0, {"open"}, Decision::kGrant, 1);
+  Set(RuleType::kSyscall, 0, {"read"}, Decision::kGrant, 2);
+  Set(RuleType::kSyscall, 0, {"open"}, Decision::kRevoke, 3);
+  const std::vector<Rule> rules = module_.Rules(RuleType::kSyscall, 0);
+  EXPECT_THAT(WordsOf(RuleType::kSyscall, 0), ElementsAre("open", "read"));
   EXPECT_EQ(rules[0].decision, Decision::kRevoke);
   EXPECT_EQ(rules[0].line, 3U);
   EXPECT_EQ(rules[1].decision, Decision::kGrant);
 }
 
 TEST_F(ModuleTest, EveryWordBelongsToTheKey) {
-  Set(RuleKind::kFileCreation, 0, {"default", "tardisk", "file"});
-  Set(RuleKind::kFileCreation, 0, {"default", "tardisk", "dir"});
-  Set(RuleKind::kFileCreation, 0, {"tardisk", "default", "file"});
-  EXPECT_THAT(WordsOf(RuleKind::kFileCreation, 0),
+  Set(RuleType::kFileCreation, 0, {"default", "tardisk", "file"});
+  Set(RuleType::kFileCreation, 0, {"default", "tardisk", "dir"});
+  Set(RuleType::kFileCreation, 0, {"tardisk", "default", "file"});
+  EXPECT_THAT(WordsOf(RuleType::kFileCreation, 0),
               ElementsAre("default tardisk file", "default tardisk dir", "tardisk default file"));
 }
 
 TEST_F(ModuleTest, ARuleWithARejectedWordIsRefused) {
   struct Row {
-    RuleKind kind;
+    RuleType type;
     std::vector<std::string> words;
     const char* refusal;
   };
   const Row rows[] = {
-      {RuleKind::kObjectAccess, {"x", "read"}, "unknown object label \"x\""},
-      {RuleKind::kObjectAccess, {"default", "x"}, "unknown object access \"x\""},
-      {RuleKind::kCapability, {"net_bind"}, "unknown capability \"net_bind\""},
-      {RuleKind::kTransition, {"x", "rootDom", "exec"}, "unknown object label \"x\""},
-      {RuleKind::kTransition, {"default", "rootDom", "x"}, "unknown transition event \"x\""},
-      {RuleKind::kTransition, {"default", "", "exec"}, "the target domain \"\" is empty"},
-      {RuleKind::kFileCreation, {"x", "default", "dir"}, "unknown object label \"x\""},
-      {RuleKind::kFileCreation, {"default", "x", "dir"}, "unknown object label \"x\""},
-      {RuleKind::kFileCreation, {"default", "default", "x"}, "unknown file type \"x\""},
-      {RuleKind::kCapabilityParam,
+      {RuleType::kObjectAccess, {"x", "read"}, "unknown object label \"x\""},
+      {RuleType::kObjectAccess, {"default", "x"}, "unknown object access \"x\""},
+      {RuleType::kCapability, {"net_bind"}, "unknown capability \"net_bind\""},
+      {RuleType::kTransition, {"x", "rootDom", "exec"}, "unknown object label \"x\""},
+      {RuleType::kTransition, {"default", "rootDom", "x"}, "unknown transition event \"x\""},
+      {RuleType::kTransition, {"default", "", "exec"}, "the target domain \"\" is empty"},
+      {RuleType::kFileCreation, {"x", "default", "dir"}, "unknown object label \"x\""},
+      {RuleType::kFileCreation, {"default", "x", "dir"}, "unknown object label \"x\""},
+      {RuleType::kFileCreation, {"default", "default", "x"}, "unknown file type \"x\""},
+      {RuleType::kCapabilityParam,
        {"sys_boot", "1"},
        "unknown capability with parameter \"sys_boot\""},
-      {RuleKind::kCapabilityParam, {"net_bind", ""}, "the parameter \"\" is empty"},
-      {RuleKind::kSyscall, {"x"}, "unknown system call \"x\""},
-      {RuleKind::kUnixSocket, {"x", "stream"}, "unknown object label \"x\""},
-      {RuleKind::kUnixSocket, {"default", "x"}, "unknown socket type \"x\""},
+      {RuleType::kCapabilityParam, {"net_bind", ""}, "the parameter \"\" is empty"},
+      {RuleType::kSyscall, {"x"}, "unknown system call \"x\""},
+      {RuleType::kUnixSocket, {"x", "stream"}, "unknown object label \"x\""},
+      {RuleType::kUnixSocket, {"default", "x"}, "unknown socket type \"x\""},
   };
   for (const Row& row : rows) {
-    EXPECT_EQ(RefusalOf([&] { Set(row.kind, 0, row.words); }),
+    EXPECT_EQ(RefusalOf([&] { Set(row.type, 0, row.words); }),
               std::string("EINVAL: ") + row.refusal);
-    EXPECT_THAT(module_.Rules(row.kind, 0), IsEmpty()) << row.refusal;
+    EXPECT_THAT(module_.Rules(row.type, 0), IsEmpty()) << row.refusal;
   }
 }
 
 TEST_F(ModuleTest, ARuleWithAWrongNumberOfWordsIsRefused) {
   EXPECT_EQ(RefusalOf([&] {
-              Set(RuleKind::kSyscall, 0, {"open", "read"});
+              Set(RuleType::kSyscall, 0, {"open", "read"});
             }),
             "EINVAL: a rule \"-s\" has 1 word, not 2");
   EXPECT_EQ(RefusalOf([&] {
-              Set(RuleKind::kFileCreation, 0, {"default", "default"});
+              Set(RuleType::kFileCreation, 0, {"default", "default"});
             }),
             "EINVAL: a rule \"-f\" has 3 words, not 2");
 }
@@ -173,29 +173,36 @@ TEST(FewWords, HoldsThreeAndNoMore) {
 TEST_F(ModuleTest, AParameterWithANulIsRefused) {
   const std::string parameter("8\0", 2);
   EXPECT_EQ(RefusalOf([&] {
-              Set(RuleKind::kCapabilityParam, 0, {"net_bind", parameter});
+              Set(RuleType::kCapabilityParam, 0, {"net_bind", parameter});
             }),
             "EINVAL: the parameter \"8\\0\" holds a NUL byte");
 }
 
 TEST_F(ModuleTest, RulesNeedADomainAndAKind) {
-  EXPECT_EQ(RefusalOf([&] { Set(RuleKind::kSyscall, 3, {"x"}); }),
+  EXPECT_EQ(RefusalOf([&] { Set(RuleType::kSyscall, 3, {"x"}); }),
             "ENOENT: no domain has the id 3");
-  EXPECT_EQ(RefusalOf([&] { module_.Rules(RuleKind::kSyscall, 3); }),
+  EXPECT_EQ(RefusalOf([&] { module_.Rules(RuleType::kSyscall, 3); }),
             "ENOENT: no domain has the id 3");
-  const auto kind = static_cast<RuleKind>(7);
-  EXPECT_EQ(RefusalOf([&] { Set(kind, 0, {"x"}); }), "EINVAL: no kind of rules has the number 7");
-  EXPECT_EQ(RefusalOf([&] { module_.Rules(kind, 0); }),
-            "EINVAL: no kind of rules has the number 7");
+  const auto type = static_cast<RuleType>(8);
+  EXPECT_EQ(RefusalOf([&] { Set(type, 0, {"x"}); }), "EINVAL: no kind of rules has the number 8");
+  EXPECT_EQ(RefusalOf([&] { module_.Rules(type, 0); }),
+            "EINVAL: no kind of rules has the number 8");
+}
+
+TEST_F(ModuleTest, PathRulesAreNotSetAsDecisions) {
+  EXPECT_EQ(RefusalOf([&] { Set(RuleType::kPath, 0, {"/etc"}); }),
+            "EINVAL: a rule \"-r\" has no decision");
+  EXPECT_EQ(RefusalOf([&] { module_.Rules(RuleType::kPath, 0); }),
+            "EINVAL: a rule \"-r\" has no decision");
 }
 
 TEST_F(ModuleTest, ATransitionNeedsATargetThatExists) {
   EXPECT_EQ(RefusalOf([&] {
-              module_.SetRule(RuleKind::kTransition, 0,
+              module_.SetRule(RuleType::kTransition, 0,
                               {1, {"default", "appDom", "exec"}, 3, Decision::kGrant});
             }),
             "ENOENT: no domain has the id 3");
-  EXPECT_THAT(module_.Rules(RuleKind::kTransition, 0), IsEmpty());
+  EXPECT_THAT(module_.Rules(RuleType::kTransition, 0), IsEmpty());
 }
 
 TEST_F(ModuleTest, TransitionsIntoADestroyedDomainVanish) {
@@ -205,7 +212,7 @@ TEST_F(ModuleTest, TransitionsIntoADestroyedDomainVanish) {
   SetTransition(0, "default", "b");
   SetTransition(0, "tardisk", "a");
   module_.DestroyDomain(a);
-  EXPECT_THAT(WordsOf(RuleKind::kTransition, 0), ElementsAre("default b exec"));
+  EXPECT_THAT(WordsOf(RuleType::kTransition, 0), ElementsAre("default b exec"));
   EXPECT_EQ(Make("a2"), a);
   SetTransition(0, "default", "a2");
   EXPECT_EQ(module_.GetDomainInfo(a)->refCount, 1U);
@@ -213,9 +220,9 @@ TEST_F(ModuleTest, TransitionsIntoADestroyedDomainVanish) {
 
 TEST_F(ModuleTest, ARemovedLabelStaysInTheRulesThatNameIt) {
   module_.AddLabels({"logs"}, kObject);
-  Set(RuleKind::kObjectAccess, 0, {"logs", "read"});
+  Set(RuleType::kObjectAccess, 0, {"logs", "read"});
   module_.RemoveLabels({"logs"}, kObject);
-  EXPECT_THAT(WordsOf(RuleKind::kObjectAccess, 0), ElementsAre("logs read"));
+  EXPECT_THAT(WordsOf(RuleType::kObjectAccess, 0), ElementsAre("logs read"));
 }
 
 // ---- Capability parameters ----
@@ -258,7 +265,7 @@ TEST_F(ModuleTest, TheSameDecisionTwiceAndDifferentParametersAreNoContradiction)
 }
 
 TEST_F(ModuleTest, WhatTheModuleHoldsDoesNotContradictAList) {
-  Set(RuleKind::kCapabilityParam, 0, {"net_bind", "80"}, Decision::kRevoke);
+  Set(RuleType::kCapabilityParam, 0, {"net_bind", "80"}, Decision::kRevoke);
   EXPECT_EQ(RefusalOf([&] {
               module_.CheckCapabilityParams("rootDom",
                                             {Param(1, "net_bind", "80", Decision::kGrant)});

@@ -18,35 +18,35 @@ TEST(OperationWordsTest, PermissionsAreLettersAndTheRestIsANumber) {
 
 TEST(OperationWordsTest, RulesAreLinesWithAComment) {
   struct Row {
-    RuleKind kind;
+    RuleType type;
     Rule rule;
     const char* words;
   };
   for (const Row& row :
-       {Row{RuleKind::kSyscall, {4, {"open"}, 0, Decision::kGrant}, "-s open grant # line 4"},
-        Row{RuleKind::kSyscall, {0, {"open"}, 0, Decision::kRevoke}, "-s open revoke"},
-        Row{RuleKind::kObjectAccess,
+       {Row{RuleType::kSyscall, {4, {"open"}, 0, Decision::kGrant}, "-s open grant # line 4"},
+        Row{RuleType::kSyscall, {0, {"open"}, 0, Decision::kRevoke}, "-s open revoke"},
+        Row{RuleType::kObjectAccess,
             {1, {"o", "read"}, 0, Decision::kGrant},
             "-a o read grant # line 1"},
-        Row{RuleKind::kCapability,
+        Row{RuleType::kCapability,
             {2, {"net_admin"}, 0, Decision::kRevoke},
             "-c net_admin revoke # line 2"},
-        Row{RuleKind::kCapabilityParam,
+        Row{RuleType::kCapabilityParam,
             {3, {"net_bind", "80"}, 0, Decision::kGrant},
             "-p net_bind 80 grant # line 3"},
-        Row{RuleKind::kTransition,
+        Row{RuleType::kTransition,
             {5, {"bin", "appDom", "exec"}, 7, Decision::kGrant},
             "-d bin appDom exec grant # line 5 into 7"},
-        Row{RuleKind::kTransition,
+        Row{RuleType::kTransition,
             {0, {"bin", "appDom", "exec"}, 0, Decision::kGrant},
             "-d bin appDom exec grant # into 0"},
-        Row{RuleKind::kFileCreation,
+        Row{RuleType::kFileCreation,
             {6, {"a", "b", "file"}, 0, Decision::kGrant},
             "-f a b file grant # line 6"},
-        Row{RuleKind::kUnixSocket,
+        Row{RuleType::kUnixSocket,
             {8, {"sock", "stream"}, 0, Decision::kGrant},
             "-u sock stream grant # line 8"}}) {
-    EXPECT_EQ(RuleWords(row.kind, row.rule), row.words);
+    EXPECT_EQ(RuleWords(row.type, row.rule), row.words);
   }
 }
 

@@ -57,8 +57,8 @@ TEST_F(TraceLogTest, WordsAndRules) {
       {"validate-word syscall open", [](auto& m) { m.ValidateWord(WordList::kSyscalls, "open"); }},
       {"words file-type", [](auto& m) { m.Words(WordList::kFileTypes); }},
       {"set-rule netDom -s open grant # line 4",
-       [&](auto& m) { m.SetRule(RuleKind::kSyscall, 1, open); }},
-      {"get-rules netDom -s", [](auto& m) { m.Rules(RuleKind::kSyscall, 1); }},
+       [&](auto& m) { m.SetRule(RuleType::kSyscall, 1, open); }},
+      {"get-rules netDom -s", [](auto& m) { m.Rules(RuleType::kSyscall, 1); }},
       {"check-capability-params netDom", [](auto& m) { m.CheckCapabilityParams("netDom", {}); }},
       {"check-capability-params netDom; -p net_bind 80 revoke # line 2; "
        "-p net_bind 80 revoke # line 2",
@@ -145,7 +145,7 @@ TEST_F(TraceLogTest, LineIsWrittenWhenTheOperationHasEnded) {
 
 TEST_F(TraceLogTest, TracingAddsNoOperations) {
   const Rule rule{1, {"open"}, 0, Decision::kGrant};
-  observed_.SetRule(RuleKind::kSyscall, 1, rule);
+  observed_.SetRule(RuleType::kSyscall, 1, rule);
   observed_.SetFileLabel("/a", 1);
   EXPECT_EQ(lines_.size(), 2u);
 }

@@ -122,7 +122,7 @@ TEST_F(MayTest, WrongNumberOfWordsIsWrongUsage) {
 TEST_F(MayTest, HelpListsTheQuestions) {
   for (const char* verb : {"may", "who"}) {
     EXPECT_THAT(Done({verb, "--help"}).out,
-                testing::HasSubstr("  read|write|exec PATH\n  ACCESS LABEL\n  syscall NAME\n"));
+                testing::HasSubstr("  read|write|exec PATH\n  ACCESS LABEL\n  capability NAME\n"));
   }
 }
 

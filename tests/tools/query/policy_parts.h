@@ -15,7 +15,7 @@ inline PolicyRule RuleOf(const std::string& text, unsigned int line = 0) {
   for (const LineWord& word : WordsOf(text)) words.push_back(word.text);
   PolicyRule rule;
   rule.key.type = TypeOfKeyword(words.at(0)).value();
-  const std::size_t count = InfoOf(rule.key.type).words.size();
+  const std::size_t count = InfoOf(rule.key.type).wordCount;
   for (std::size_t i = 1; i <= count; ++i) rule.key.words.push_back(words.at(i));
   const std::string decision = words.size() > count + 1 ? words.back() : "";
   rule.isGranted = decision == "grant";

@@ -188,10 +188,9 @@ TEST(ReportPageTest, WordsOfThePolicyAreInert) {
   const Place place{evil, 1, 1};
   DomainContent& domain = report.policy.domains[evil];
   domain.place = place;
-  for (std::size_t i = 0; i < RuleTypes().size(); ++i) {
+  for (std::size_t i = 0; i < kRuleTypes.size(); ++i) {
     const auto type = static_cast<RuleType>(i);
-    domain.rules.push_back(
-        SomeRule(type, std::vector<std::string>(InfoOf(type).words.size(), evil)));
+    domain.rules.push_back(SomeRule(type, std::vector<std::string>(InfoOf(type).wordCount, evil)));
     domain.rules.back().place = place;
   }
   report.policy.objects[evil] = {false, place};
