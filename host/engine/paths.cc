@@ -1,6 +1,6 @@
-#include "tools/query/paths.h"
+#include "host/engine/paths.h"
 
-namespace SecPolicyTool {
+namespace StandIn {
 
 std::string NormalPath(const std::string& path) {
   std::string normal;
@@ -25,4 +25,4 @@ bool IsAtOrBelow(const std::string& path, const std::string& directory) {
   return directory == "/" || path.size() == directory.size() || path[directory.size()] == '/';
 }
 
-}  // namespace SecPolicyTool
+}  // namespace StandIn

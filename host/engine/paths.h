@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-namespace SecPolicyTool {
+namespace StandIn {
 
 // `path` without doubled slashes and without a slash at its end.
 std::string NormalPath(const std::string& path);
@@ -15,4 +15,4 @@ std::vector<std::string> WithParents(const std::string& path);
 // Whether `path` is `directory` or lies below it, component by component. Both are normal paths.
 bool IsAtOrBelow(const std::string& path, const std::string& directory);
 
-}  // namespace SecPolicyTool
+}  // namespace StandIn

@@ -16,9 +16,7 @@
 namespace StandIn {
 namespace {
 
-void Pause(int milliseconds) {
-  std::this_thread::sleep_for(std::chrono::milliseconds(milliseconds));
-}
+void Pause(int time) { std::this_thread::sleep_for(std::chrono::milliseconds(time)); }
 
 class StateFileTest : public HostFixture {
  protected:
