@@ -27,17 +27,14 @@ class SavedModule {
     std::istringstream stream(line);
     std::string keyword;
     stream >> keyword;
-    std::size_t kind = 0;
-    while (keyword != StandIn::kRuleKindInfo.at(kind).keyword) ++kind;
+    const auto& info = *StandIn::FindRuleType(keyword);
     StandIn::Rule rule;
     std::string word;
-    while (rule.words.size() < StandIn::kRuleKindInfo[kind].words && stream >> word) {
-      rule.words.push_back(word);
+    while (rule.words.size() < info.wordCount && stream >> word) rule.words.push_back(word);
+    if (const auto position = info.DomainWord()) {
+      rule.targetDomain = *module_.FindDomain(rule.words[*position]);
     }
-    if (static_cast<StandIn::RuleKind>(kind) == StandIn::RuleKind::kTransition) {
-      rule.targetDomain = *module_.FindDomain(rule.words[1]);
-    }
-    module_.SetRule(static_cast<StandIn::RuleKind>(kind), domain, rule);
+    module_.SetRule(info.type, domain, rule);
   }
 
  private:

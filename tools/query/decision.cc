@@ -1,36 +1,37 @@
 #include "tools/query/decision.h"
 
-#include "tools/query/paths.h"
+#include "host/engine/accesses.h"
+#include "host/engine/engine.h"
 
 namespace SecPolicyTool {
 
-DomainDecisions::DomainDecisions(const DomainContent& domain) {
-  for (const PolicyRule& rule : domain.rules) {
+DomainDecisions::DomainDecisions(const DomainContent& domain) : content_(domain) {
+  for (std::size_t number = 0; number < domain.rules.size(); ++number) {
+    const PolicyRule& rule = domain.rules[number];
     if (rule.key.world != 0) continue;
-    RuleKey key = rule.key;
-    if (key.type == RuleType::kPath) key.words[0] = NormalPath(key.words[0]);
-    rules_[std::move(key)] = &rule;
+    rules_.Add(rule.key.type, rule.key.words, {rule.isGranted, rule.permission, number});
   }
 }
 
-const PolicyRule* DomainDecisions::Find(const RuleKey& key) const {
-  const auto rule = rules_.find(key);
-  return rule == rules_.end() ? nullptr : rule->second;
+const PolicyRule* DomainDecisions::RuleOf(std::optional<std::size_t> number) const {
+  return number ? &content_.rules[*number] : nullptr;
 }
 
-const PolicyRule* DomainDecisions::FindAbove(const std::string& path) const {
-  std::vector<std::string> paths = WithParents(path);
-  for (; !paths.empty(); paths.pop_back()) {
-    if (const PolicyRule* rule = Find({RuleType::kPath, {paths.back()}, 0})) return rule;
+Answer DomainDecisions::DecideOnFile(const AskedFile& file) const {
+  const StandIn::Subject subject{rules_};
+  if (file.access == StandIn::kExecAccess) {
+    const auto verdict = StandIn::DecideExec(subject, file.object);
+    return {verdict.isAllowed, RuleOf(verdict.rule), RuleOf(verdict.transition)};
   }
-  return nullptr;
+  const auto verdict = StandIn::DecideAccess(subject, file.access, file.object);
+  return {verdict.isAllowed, RuleOf(verdict.rule)};
 }
 
 Answer DomainDecisions::Decide(const Question& question) const {
-  const bool isPath = question.key.type == RuleType::kPath;
-  const PolicyRule* rule = isPath ? FindAbove(question.key.words[0]) : Find(question.key);
+  if (question.file) return DecideOnFile(*question.file);
+  const StandIn::NumberedRule* const rule = rules_.Find(question.key.type, question.key.words);
   if (rule == nullptr) return {};
-  return {isPath ? (rule->permission & question.permission) != 0 : rule->isGranted, rule};
+  return {rule->isGranted, RuleOf(rule->number)};
 }
 
 Decisions::Decisions(const Policy& policy) {
@@ -50,9 +51,24 @@ TerminalText RuleText(const PolicyRule& rule) {
   return rule.place ? line + " (" + PlaceText(rule.place) + ")" : line;
 }
 
-TerminalText AnswerText(const Answer& answer) {
-  const TerminalText decision = answer.isAllowed ? "yes: " : "no: ";
-  return decision + (answer.rule == nullptr ? "no rule" : RuleText(*answer.rule));
+namespace {
+
+TerminalText NoRuleText(const Question& question) {
+  if (!question.file) return "no rule";
+  const auto& label = question.file->object.label;
+  return label ? "no rule for the path or the label " + *label : "no rule for the path";
+}
+
+}  // namespace
+
+TerminalText AnswerText(const Question& question, const Answer& answer) {
+  TerminalText text = answer.isAllowed ? "yes: " : "no: ";
+  text += answer.rule == nullptr ? NoRuleText(question) : RuleText(*answer.rule);
+  if (answer.transition != nullptr) {
+    text += "; continues in " + answer.transition->key.words.at(1) + ": " +
+            RuleText(*answer.transition);
+  }
+  return text;
 }
 
 }  // namespace SecPolicyTool

@@ -21,6 +21,9 @@ class HostPaths {
     return root_.ResolvedOrSame(path);
   }
 
+  // Whether `path` leads to something there.
+  [[nodiscard]] bool Exists(const std::string& path) const { return root_.Exists(path); }
+
  private:
   StandIn::FileTree root_;
 };

@@ -21,7 +21,7 @@ std::vector<Outcome> Judge(const Policy& policy, const std::vector<Statement>& s
 }
 
 TerminalText OutcomeText(const Statement& statement, const Outcome& outcome) {
-  if (statement.target.empty()) return AnswerText(outcome.answer);
+  if (statement.target.empty()) return AnswerText(statement.question, outcome.answer);
   if (!outcome.way) return "no way";
   if (outcome.way->empty()) return "the same domain";
   TerminalText text;

@@ -4,11 +4,11 @@
 #include <array>
 #include <optional>
 
+#include "host/engine/accesses.h"
 #include "host/module/nearest_word.h"
 #include "host/module/word_lists.h"
 #include "host/text/escaped.h"
 #include "tools/policy/unknown_word.h"
-#include "tools/query/paths.h"
 
 namespace SecPolicyTool {
 
@@ -39,33 +39,20 @@ std::string FormOf(const RuleTypeInfo& info) {
 // Any operation that no type claims is an access to a label.
 constexpr RuleType kOtherOperations = RuleType::kObjectAccess;
 
-struct PathOperation {
-  const char* word;
-  std::uint32_t permission;
-};
-constexpr std::array<PathOperation, 3> kPathOperations{
-    {{"read", 0x1}, {"write", 0x2}, {"exec", 0x10}}};
-
-bool IsPathQuestion(const Words& words) {
+// "create PATH" is an access to a file, although "create" begins another question.
+bool IsFileQuestion(const Words& words) {
+  if (words.size() != 2 || !words[1].starts_with('/')) return false;
   const bool isNamed =
       std::any_of(kRuleTypes.begin(), kRuleTypes.end(),
                   [&](const RuleTypeInfo& info) { return HasOperation(info, words[0]); });
-  return !isNamed && words.size() == 2 && words[1].starts_with('/');
+  return !isNamed || StandIn::PermissionFor(words[0]).has_value();
 }
 
 [[noreturn]] void RefuseForm(const std::string& text) {
   throw BadQuestion(BadQuestion::Kind::kForm, 0, text);
 }
 
-std::uint32_t PathPermission(const std::string& word) {
-  for (const PathOperation& each : kPathOperations) {
-    if (word == each.word) return each.permission;
-  }
-  RefuseForm("there is no operation " + Escaped(word).Text() +
-             " on a path; there are read, write and exec");
-}
-
-// The type that the words ask for, unless they ask for a path.
+// The type that the words ask for, unless they ask for a file.
 RuleType TypeAskedFor(const Words& words) {
   std::string forms;
   for (const RuleTypeInfo& info : kRuleTypes) {
@@ -90,6 +77,13 @@ std::string NearestText(const std::string& word, Words known) {
   return nearest && *nearest != word ? " (nearest: " + Escaped(*nearest).Text() + ")" : "";
 }
 
+// What is wrong with the word for an access; nothing when it will do.
+std::optional<std::string> AccessProblem(const std::string& word, const Vocabulary& vocabulary) {
+  const Words& accesses = vocabulary.lists.at(StandIn::WordList::kObjectAccesses);
+  if (Holds(accesses, word)) return std::nullopt;
+  return "unknown operation \"" + Escaped(word).Text() + "\"" + NearestText(word, accesses);
+}
+
 // What is wrong with the word for that place of a rule; nothing when it will do.
 std::optional<std::string> ProblemOf(const std::string& word, const RuleWordInfo& info,
                                      const Vocabulary& vocabulary) {
@@ -97,21 +91,28 @@ std::optional<std::string> ProblemOf(const std::string& word, const RuleWordInfo
     return UnknownWordText("domain", word, vocabulary.domains);
   }
   if (!info.list) return std::nullopt;
+  if (info.questionPosition == 0) return AccessProblem(word, vocabulary);
   const StandIn::WordList which = StandIn::ToModule(*info.list);
   const Words& list = vocabulary.lists.at(which);
   if (Holds(list, word)) return std::nullopt;
-  return info.questionPosition == 0
-             ? "unknown operation \"" + Escaped(word).Text() + "\"" + NearestText(word, list)
-             : StandIn::UnknownWordText(which, word, list);
+  return StandIn::UnknownWordText(which, word, list);
+}
+
+Question FileQuestion(const Words& words, const Vocabulary& vocabulary,
+                      const FileResolver& resolve) {
+  // What path rules decide on may be asked even where the host has no such word for labels.
+  const auto problem =
+      StandIn::PermissionFor(words[0]) ? std::nullopt : AccessProblem(words[0], vocabulary);
+  if (problem) throw BadQuestion(BadQuestion::Kind::kWord, 0, *problem);
+  StandIn::FileObject object = resolve(words[1]);
+  RuleKey key{RuleType::kPath, {object.path}, 0};
+  return {std::move(key), AskedFile{words[0], std::move(object)}};
 }
 
 }  // namespace
 
 void CheckForm(const Words& words) {
-  if (IsPathQuestion(words)) {
-    PathPermission(words[0]);
-    return;
-  }
+  if (IsFileQuestion(words)) return;
   if (TypeAskedFor(words) == kOtherOperations && words.size() != 2) {
     RefuseForm(Escaped(words[0]).Text() + " is no operation with " +
                std::to_string(words.size() - 1) + " words" + NearestText(words[0], {}));
@@ -119,11 +120,9 @@ void CheckForm(const Words& words) {
 }
 
 Question ParseQuestion(const Words& words, const Vocabulary& vocabulary,
-                       const PathResolver& resolve) {
+                       const FileResolver& resolve) {
   CheckForm(words);
-  if (IsPathQuestion(words)) {
-    return {{RuleType::kPath, {NormalPath(resolve(words[1]))}, 0}, PathPermission(words[0])};
-  }
+  if (IsFileQuestion(words)) return FileQuestion(words, vocabulary, resolve);
   RuleKey key{TypeAskedFor(words), {}, 0};
   std::array<std::optional<std::string>, kMostQuestionWords> problems;
   for (const RuleWordInfo& info : InfoOf(key.type).Words()) {
@@ -135,11 +134,11 @@ Question ParseQuestion(const Words& words, const Vocabulary& vocabulary,
     const auto& problem = problems.at(position);
     if (problem) throw BadQuestion(BadQuestion::Kind::kWord, position, *problem);
   }
-  return {std::move(key), 0};
+  return {std::move(key), std::nullopt};
 }
 
 std::string QuestionForms() {
-  std::string forms = "  read|write|exec PATH";
+  std::string forms = "  ACCESS PATH";
   for (const RuleTypeInfo& info : kRuleTypes) {
     if (info.HasDecision()) forms += "\n  " + FormOf(info);
   }

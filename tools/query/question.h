@@ -3,20 +3,27 @@
 
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <string>
 #include <vector>
 
+#include "host/engine/engine.h"
 #include "tools/policy/policy.h"
 #include "tools/query/bad_request.h"
 #include "tools/query/vocabulary.h"
 
 namespace SecPolicyTool {
 
-// What is asked: whether a rule with this key grants, or for a path, whether the path rule that
-// decides on it permits `permission`, a bit of StandIn::kPermissionBits.
+// An access, a word such as "append", to a file.
+struct AskedFile {
+  std::string access;
+  StandIn::FileObject object;
+};
+
+// What is asked: whether a rule with this key grants; or whether the domain may access a file.
 struct Question {
-  RuleKey key;
-  std::uint32_t permission = 0;
+  RuleKey key;                    // of a question about a file, of a path rule for that file
+  std::optional<AskedFile> file;  // nothing for other questions
 };
 
 // What is wrong with a question.
@@ -43,16 +50,16 @@ class BadQuestion : public BadRequest {
 // without knowing a host's words. Throws BadQuestion (kForm):
 //   "OPERATION takes other words: FORM [or FORM]"
 //   "WORD is no operation with N words (nearest: OPERATION)"
-//   "there is no operation OPERATION on a path; there are read, write and exec"
 void CheckForm(const std::vector<std::string>& words);
 
-using PathResolver = std::function<std::string(const std::string&)>;
+// The file that an absolute path leads to, and its label.
+using FileResolver = std::function<StandIn::FileObject(const std::string&)>;
 
-// The question in `words`. `resolve` is handed paths. Throws BadQuestion: those of CheckForm, and
-// (kWord) "unknown operation "WORD" (nearest: NEAREST)", "unknown LIST "WORD" (nearest: NEAREST)",
-// `unknown domain "NAME" (nearest: OTHER)`.
+// The question in `words`. `resolve` is handed absolute paths. Throws BadQuestion: those of
+// CheckForm, and (kWord) "unknown operation "WORD" (nearest: NEAREST)", "unknown LIST "WORD"
+// (nearest: NEAREST)", `unknown domain "NAME" (nearest: OTHER)`.
 Question ParseQuestion(const std::vector<std::string>& words, const Vocabulary& vocabulary,
-                       const PathResolver& resolve);
+                       const FileResolver& resolve);
 
 // The forms of questions, a line each, for help.
 std::string QuestionForms();

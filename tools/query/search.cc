@@ -3,7 +3,8 @@
 #include <algorithm>
 #include <map>
 
-#include "tools/query/paths.h"
+#include "host/engine/domain_rules.h"
+#include "host/engine/paths.h"
 
 namespace SecPolicyTool {
 
@@ -12,14 +13,19 @@ namespace {
 // The path rules of a domain that decide on a path, by their world.
 using Deciding = std::map<StandIn::WorldId, const PolicyRule*>;
 
-std::string PathOf(const PolicyRule& rule) { return NormalPath(rule.key.words[0]); }
+std::string PathOf(const PolicyRule& rule) { return StandIn::NormalPath(rule.key.words[0]); }
 
 Deciding DecidingOn(const std::string& path, const DomainContent& domain) {
+  std::map<StandIn::WorldId, StandIn::DomainRules> rulesOf;
+  for (std::size_t number = 0; number < domain.rules.size(); ++number) {
+    const PolicyRule& rule = domain.rules[number];
+    if (rule.key.type != RuleType::kPath) continue;
+    rulesOf[rule.key.world].Add(rule.key.type, rule.key.words, {false, rule.permission, number});
+  }
   Deciding deciding;
-  for (const PolicyRule& rule : domain.rules) {
-    if (rule.key.type != RuleType::kPath || !IsAtOrBelow(path, PathOf(rule))) continue;
-    const PolicyRule*& best = deciding[rule.key.world];
-    if (best == nullptr || PathOf(*best).size() <= PathOf(rule).size()) best = &rule;
+  for (const auto& [world, rules] : rulesOf) {
+    const StandIn::NumberedRule* const rule = rules.FindForPath(path);
+    if (rule != nullptr) deciding[world] = &domain.rules[rule->number];
   }
   return deciding;
 }
@@ -32,7 +38,7 @@ bool SpeaksOf(const PolicyRule& rule, const std::string& path, const Deciding& d
   if (rule.key.type != RuleType::kPath) return false;
   const auto best = deciding.find(rule.key.world);
   const bool isDeciding = best != deciding.end() && best->second == &rule;
-  return isDeciding || IsAtOrBelow(PathOf(rule), path);
+  return isDeciding || StandIn::IsAtOrBelow(PathOf(rule), path);
 }
 
 bool HoldsFor(const SearchTerms& terms, const PolicyRule& rule) {

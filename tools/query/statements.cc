@@ -69,7 +69,7 @@ std::string Joined(const Words& words) {
   return text;
 }
 
-Question QuestionIn(const Words& words, const Vocabulary& vocabulary, const PathResolver& resolve) {
+Question QuestionIn(const Words& words, const Vocabulary& vocabulary, const FileResolver& resolve) {
   constexpr std::size_t kFirst = 2;
   try {
     return ParseQuestion({words.begin() + kFirst, words.end()}, vocabulary, resolve);
@@ -79,7 +79,7 @@ Question QuestionIn(const Words& words, const Vocabulary& vocabulary, const Path
 }
 
 Statement ParseStatement(const Words& words, const Vocabulary& vocabulary,
-                         const PathResolver& resolve) {
+                         const FileResolver& resolve) {
   Statement statement;
   statement.kind = FormOf(words).kind;
   statement.text = Joined(words);
@@ -101,7 +101,7 @@ Statement ParseStatement(const Words& words, const Vocabulary& vocabulary,
 }  // namespace
 
 StatementFile ParseStatements(const PolicyText& text, const Vocabulary& vocabulary,
-                              const PathResolver& resolve) {
+                              const FileResolver& resolve) {
   StatementFile file;
   for (const PolicyLine& line : text.lines) {
     Words words;

@@ -48,7 +48,7 @@ struct StatementFile {
 //   "unknown transition event "WORD" (nearest: NEAREST)"
 //   "the line is longer than 1023 bytes; what is behind it is not read"
 StatementFile ParseStatements(const PolicyText& text, const Vocabulary& vocabulary,
-                              const PathResolver& resolve);
+                              const FileResolver& resolve);
 
 // The forms of statements, a line each, for help.
 std::string StatementForms();

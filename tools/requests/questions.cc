@@ -3,6 +3,8 @@
 #include <nlohmann/json.hpp>
 #include <utility>
 
+#include "host/engine/paths.h"
+#include "host/image/image_index.h"
 #include "tools/query/rule_json.h"
 
 namespace SecPolicyTool {
@@ -12,9 +14,31 @@ using nlohmann::json;
 AskedPolicy::AskedPolicy(Policy askedPolicy, const StandIn::HostDirectory& host)
     : policy(std::move(askedPolicy)), vocabulary(VocabularyOf(host, policy)), paths(host) {}
 
+namespace {
+
+// Where the policy says which label a path carries; nullptr when it carries `default`.
+const LabelledFile* LabelledAt(const Policy& policy, const std::string& path) {
+  const std::string archives = std::string(StandIn::kArchivesPath) + "/";
+  const bool isTardisk = path.starts_with(archives);
+  const auto& labelled = isTardisk ? policy.tardisks : policy.files;
+  const auto found = labelled.find(isTardisk ? path.substr(archives.size()) : path);
+  return found == labelled.end() ? nullptr : &found->second;
+}
+
+}  // namespace
+
+StandIn::FileObject AskedPolicy::FileAt(const std::string& path) const {
+  StandIn::FileObject file{StandIn::NormalPath(paths.Resolve(path)), std::nullopt};
+  if (const LabelledFile* const labelled = LabelledAt(policy, file.path)) {
+    if (!labelled->label.empty()) file.label = labelled->label;
+  } else if (paths.Exists(file.path)) {
+    file.label = kUnlabelled;
+  }
+  return file;
+}
+
 Question AskedPolicy::Parse(const std::vector<std::string>& words) const {
-  return ParseQuestion(words, vocabulary,
-                       [this](const std::string& path) { return paths.Resolve(path); });
+  return ParseQuestion(words, vocabulary, [this](const std::string& path) { return FileAt(path); });
 }
 
 std::vector<AllowedDomain> AllowedBy(const Policy& policy, const Question& question) {
@@ -34,7 +58,11 @@ json PutJson(const PutQuestion& put, const Question& question) {
              {"operation", put.words.front()},
              {"objects", std::vector<std::string>(put.words.begin() + 1, put.words.end())},
              {"type", InfoOf(question.key.type).keyword}};
-  if (question.key.type == RuleType::kPath) entry["path"] = question.key.words[0];
+  if (question.file) {
+    const StandIn::FileObject& file = question.file->object;
+    entry["path"] = file.path;
+    entry["label"] = file.label ? json(*file.label) : json();
+  }
   return entry;
 }
 
@@ -46,6 +74,7 @@ json MayJson(const PutQuestion& put, const std::string& domain, const Question& 
   content["domain"] = domain;
   content["allowed"] = answer.isAllowed;
   content["rule"] = RuleJson(answer.rule);
+  if (question.file) content["transition"] = RuleJson(answer.transition);
   return content;
 }
 

@@ -18,6 +18,10 @@ struct AskedPolicy {
   // Throws HostError when the host is damaged.
   AskedPolicy(Policy askedPolicy, const StandIn::HostDirectory& host);
 
+  // The file that `path`, an absolute one, leads to, with the label that the policy gives it. What
+  // the host does not have, and what carries a label that was removed, has none.
+  [[nodiscard]] StandIn::FileObject FileAt(const std::string& path) const;
+
   // Throws BadQuestion.
   [[nodiscard]] Question Parse(const std::vector<std::string>& words) const;
 

@@ -5,9 +5,9 @@
 #include <memory>
 #include <nlohmann/json.hpp>
 
+#include "host/engine/paths.h"
 #include "host/text/escaped.h"
 #include "tools/query/bad_request.h"
-#include "tools/query/paths.h"
 #include "tools/query/rule_json.h"
 #include "tools/query/vocabulary.h"
 
@@ -69,7 +69,7 @@ SearchTerms TermsOf(const SearchRequest& request, const HostPaths& paths) {
   terms.domain = request.domain;
   if (request.type) terms.type = TypeNamed(*request.type);
   terms.word = WordTerm(request);
-  if (request.path) terms.path = NormalPath(paths.Resolve(*request.path));
+  if (request.path) terms.path = StandIn::NormalPath(paths.Resolve(*request.path));
   terms.isGranted = request.isGranted;
   return terms;
 }

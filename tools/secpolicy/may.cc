@@ -30,7 +30,9 @@ ExitStatus PrintAnswer(const MayArguments& arguments) {
         MayJson({arguments.asking.policy, arguments.words}, arguments.domain, question, answer));
   } else {
     const Painter painter(WantsColour(STDOUT_FILENO));
-    std::cout << painter.Paint(answer.isAllowed ? Colour::kGreen : Colour::kRed, AnswerText(answer))
+    std::cout << painter
+                     .Paint(answer.isAllowed ? Colour::kGreen : Colour::kRed,
+                            AnswerText(question, answer))
                      .EndLine();
   }
   return answer.isAllowed ? kDone : kFailed;

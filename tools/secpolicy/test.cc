@@ -35,8 +35,8 @@ std::string ContentOf(const std::string& path) {
 // A file with a mistake is not run: what is left of it could pass for the whole.
 std::vector<Statement> StatementsIn(const PolicyText& text, const AskedPolicy& asked,
                                     const std::string& path) {
-  StatementFile file = ParseStatements(
-      text, asked.vocabulary, [&](const std::string& name) { return asked.paths.Resolve(name); });
+  StatementFile file = ParseStatements(text, asked.vocabulary,
+                                       [&](const std::string& name) { return asked.FileAt(name); });
   for (const StatementProblem& problem : file.problems) {
     ReportError(StandIn::Escaped(path).Text() + ":" + std::to_string(problem.line) + ":" +
                 std::to_string(problem.column) + ": " + problem.text);

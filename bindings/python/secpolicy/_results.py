@@ -226,7 +226,10 @@ class Answer:
     domain: str
     allowed: bool
     rule: Rule | None  #: what decided; None when no rule speaks
-    path: str | None   #: of a question about a path: what it was resolved to
+    path: str | None   #: of a question about a file: what its path was resolved to
+    label: str | None  #: of a question about a file: its label, if it has one
+    #: of the execution of a file that is allowed: what moves the program to another domain
+    transition: Rule | None
 
     def __bool__(self) -> bool:
         return self.allowed
@@ -234,5 +237,7 @@ class Answer:
     @classmethod
     def _of(cls, entry: Json) -> Answer:
         rule = entry["rule"]
+        transition = entry.get("transition")
         return cls(entry["domain"], entry["allowed"], None if rule is None else Rule._of(rule),
-                   entry.get("path"))
+                   entry.get("path"), entry.get("label"),
+                   None if transition is None else Rule._of(transition))

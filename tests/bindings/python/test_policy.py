@@ -57,9 +57,12 @@ class PolicyTest(HostTest):
         self.assertTrue(answer)
         self.assertEqual((answer.domain, answer.path, answer.rule.line),
                          ("appDom", "/etc/hosts", "-r /etc rw"))
+        self.assertEqual((answer.label, answer.transition), (None, None))
+        self.assertEqual(self.read.may("appDom", "getattr", "/").label, "default")
         refused = self.read.may("ioFilterDom", "syscall", "open")
         self.assertFalse(refused)
         self.assertIsNone(refused.rule)
+        self.assertIsNone(refused.label)
 
     def test_who(self):
         match, = self.read.who("syscall", "read")

@@ -197,14 +197,14 @@ TEST_F(PersistenceTest, TheOrderOfMembersInTheFileDoesNotMatter) {
     "format": 1})",
                   "kernel.json");
   EXPECT_EQ(module_.FileLabel("/a"), 3U);
-  EXPECT_THAT(WordsOf(RuleKind::kSyscall, 1), ElementsAre("open"));
+  EXPECT_THAT(WordsOf(RuleType::kSyscall, 1), ElementsAre("open"));
   EXPECT_EQ(module_.CountFileRules(1), 1U);
 }
 
 TEST_F(PersistenceTest, AStateLongerThanABlockComesBackTheSame) {
   const DomainId app = Make("app");
   for (std::uint32_t i = 0; i < 10'000; ++i) {
-    Set(RuleKind::kCapabilityParam, app, {"net_bind", "parameter" + std::to_string(i)},
+    Set(RuleType::kCapabilityParam, app, {"net_bind", "parameter" + std::to_string(i)},
         Decision::kGrant, i);
   }
   ASSERT_GT(module_.Save().size(), 400'000U);

@@ -15,7 +15,7 @@ Vocabulary Words() {
   vocabulary.lists = {{WordList::kObjects, {"conf", "program", "socket"}},
                       {WordList::kCapabilities, {"sys_admin", "net_bind_service"}},
                       {WordList::kParamCapabilities, {"net_bind_service"}},
-                      {WordList::kObjectAccesses, {"read", "write", "append"}},
+                      {WordList::kObjectAccesses, {"read", "write", "append", "exec", "connect"}},
                       {WordList::kTransitionEvents, {"exec", "fork"}},
                       {WordList::kFileTypes, {"file", "dir"}},
                       {WordList::kSocketTypes, {"stream", "dgram"}},
@@ -27,7 +27,15 @@ Vocabulary Words() {
 Question Ask(const std::string& text) {
   std::vector<std::string> words;
   for (const LineWord& word : WordsOf(text)) words.push_back(word.text);
-  return ParseQuestion(words, Words(), [](const std::string& path) { return path; });
+  return ParseQuestion(words, Words(), [](const std::string& path) -> StandIn::FileObject {
+    if (path.starts_with("/none")) return {path, std::nullopt};
+    return {path, path.starts_with("/srv") ? "conf" : "default"};
+  });
+}
+
+std::string TextFor(const DomainDecisions& decisions, const std::string& text) {
+  const Question question = Ask(text);
+  return AnswerText(question, decisions.Decide(question)).Text();
 }
 
 DomainContent Domain() {
@@ -85,8 +93,9 @@ TEST(DecisionTest, TheRuleThatSpeaksDecides) {
            Row{"socket dgram socket", "no: -u socket dgram revoke (policy:18:1)"},
            Row{"socket stream conf", "no: no rule"},
        }) {
-    EXPECT_EQ(AnswerText(Decide(policy, "appDom", Ask(row.question))), row.answer) << row.question;
-    EXPECT_EQ(AnswerText(Decisions(policy).Decide("appDom", Ask(row.question))), row.answer);
+    const Question question = Ask(row.question);
+    EXPECT_EQ(AnswerText(question, Decide(policy, "appDom", question)), row.answer) << row.question;
+    EXPECT_EQ(AnswerText(question, Decisions(policy).Decide("appDom", question)), row.answer);
   }
 }
 
@@ -112,27 +121,58 @@ TEST(DecisionTest, TheLongestPathDecides) {
            Row{"exec /usr/bin/ls", "yes: -r /usr/bin rx (policy:14:1)"},
            Row{"write /usr/bin/ls", "no: -r /usr/bin rx (policy:14:1)"},
        }) {
-    EXPECT_EQ(AnswerText(decisions.Decide(Ask(row.question))), row.answer) << row.question;
+    EXPECT_EQ(TextFor(decisions, row.question), row.answer) << row.question;
   }
 }
 
 TEST(DecisionTest, WithoutARuleForAllPathsSomeHaveNone) {
   const DomainContent domain = DomainWith({"-r /var/log rw"});
-  EXPECT_EQ(AnswerText(DomainDecisions(domain).Decide(Ask("read /etc"))), "no: no rule");
-  EXPECT_EQ(AnswerText(DomainDecisions(domain).Decide(Ask("read /"))), "no: no rule");
+  const DomainDecisions decisions(domain);
+  EXPECT_EQ(TextFor(decisions, "read /etc"), "no: no rule for the path or the label default");
+  EXPECT_EQ(TextFor(decisions, "read /"), "no: no rule for the path or the label default");
+  EXPECT_EQ(TextFor(decisions, "read /none"), "no: no rule for the path");
+}
+
+TEST(DecisionTest, WhereNoPathRuleSpeaksTheFilesLabelDecides) {
+  struct Row {
+    const char* question;
+    const char* answer;
+  };
+  const DomainContent domain = DomainWith({
+      "-a conf read grant",
+      "-a conf write revoke",
+      "-a conf connect grant",
+      "-r /srv/private",
+      "-d conf netDom exec grant",
+      "-a conf exec grant",
+  });
+  const DomainDecisions decisions(domain);
+  for (const Row& row : {
+           Row{"read /srv/x", "yes: -a conf read grant (policy:1:1)"},
+           Row{"write /srv/x", "no: -a conf write revoke (policy:2:1)"},
+           Row{"append /srv/x", "no: no rule for the path or the label conf"},
+           Row{"read /srv/private/x", "no: -r /srv/private (policy:4:1)"},
+           // No letter stands for it, so that a path rule cannot speak of it.
+           Row{"connect /srv/private/x", "yes: -a conf connect grant (policy:3:1)"},
+           Row{"exec /srv/x",
+               "yes: -a conf exec grant (policy:6:1); continues in netDom: "
+               "-d conf netDom exec grant (policy:5:1)"},
+           Row{"exec /srv/private/x", "no: -r /srv/private (policy:4:1)"},
+           Row{"exec conf", "yes: -a conf exec grant (policy:6:1)"},
+       }) {
+    EXPECT_EQ(TextFor(decisions, row.question), row.answer) << row.question;
+  }
 }
 
 TEST(DecisionTest, SlashAtTheEndOfARulesPathDoesNotCount) {
   const DomainContent domain = DomainWith({"-r /srv/ r"});
-  EXPECT_EQ(AnswerText(DomainDecisions(domain).Decide(Ask("read /srv/x"))),
-            "yes: -r /srv/ r (policy:1:1)");
+  EXPECT_EQ(TextFor(DomainDecisions(domain), "read /srv/x"), "yes: -r /srv/ r (policy:1:1)");
 }
 
 TEST(DecisionTest, RulesForOneWorldDecideNothingForTheirDomain) {
   DomainContent domain = DomainWith({"-r /etc r", "-r /etc rw"});
   domain.rules[1].key.world = 4711;
-  EXPECT_EQ(AnswerText(DomainDecisions(domain).Decide(Ask("write /etc/motd"))),
-            "no: -r /etc r (policy:1:1)");
+  EXPECT_EQ(TextFor(DomainDecisions(domain), "write /etc/motd"), "no: -r /etc r (policy:1:1)");
 }
 
 TEST(DecisionTest, UnknownDomainIsRefused) {
@@ -142,7 +182,7 @@ TEST(DecisionTest, UnknownDomainIsRefused) {
 
 TEST(DecisionTest, PlaceIsLeftOutWhenItIsNotKnown) {
   const PolicyRule rule = RuleOf("-s open grant");
-  EXPECT_EQ(AnswerText({true, &rule}), "yes: -s open grant");
+  EXPECT_EQ(AnswerText({}, {true, &rule}), "yes: -s open grant");
 }
 
 // ---- Questions that are none ----
@@ -158,6 +198,7 @@ TEST(QuestionTest, MistakesAreNamedWithTheirWord) {
            Row{"raed conf", 0, "unknown operation \"raed\" (nearest: read)"},
            Row{"frobnicate conf", 0, "unknown operation \"frobnicate\""},
            Row{"raed cnf", 0, "unknown operation \"raed\" (nearest: read)"},
+           Row{"raed /etc", 0, "unknown operation \"raed\" (nearest: read)"},
            Row{"read cnf", 1, "unknown object label \"cnf\" (nearest: conf)"},
            Row{"syscall opn", 1, "unknown system call \"opn\" (nearest: open)"},
            Row{"capability sysadmin", 1, "unknown capability \"sysadmin\" (nearest: sys_admin)"},
@@ -203,8 +244,6 @@ TEST(QuestionTest, WrongFormsCanBeToldWithoutWords) {
            Row{{"read"}, "read is no operation with 0 words"},
            Row{{"read", "a", "b"}, "read is no operation with 2 words"},
            Row{{"creat", "file", "a", "b"}, "creat is no operation with 3 words (nearest: create)"},
-           Row{{"append", "/etc/motd"},
-               "there is no operation append on a path; there are read, write and exec"},
        }) {
     try {
       CheckForm(row.words);
@@ -218,10 +257,20 @@ TEST(QuestionTest, WrongFormsCanBeToldWithoutWords) {
 }
 
 TEST(QuestionTest, PathIsWhatItResolvesTo) {
-  const Question question =
-      ParseQuestion({"exec", "/bin/ls"}, Words(),
-                    [](const std::string& path) { return path == "/bin/ls" ? "/usr/bin/ls" : ""; });
+  const Question question = ParseQuestion(
+      {"exec", "/bin/ls"}, Words(), [](const std::string& path) -> StandIn::FileObject {
+        return {path == "/bin/ls" ? "/usr/bin/ls" : "", "program"};
+      });
   EXPECT_EQ(question.key, (RuleKey{RuleType::kPath, {"/usr/bin/ls"}, 0}));
+  EXPECT_EQ(question.file->access, "exec");
+  EXPECT_EQ(question.file->object.path, "/usr/bin/ls");
+  EXPECT_EQ(question.file->object.label, "program");
+}
+
+TEST(QuestionTest, CreateOfAPathIsAnAccess) {
+  EXPECT_EQ(Ask("create /etc").file->access, "create");
+  EXPECT_EQ(Ask("create file conf program").file, std::nullopt);
+  EXPECT_THROW(Ask("socket /etc"), BadQuestion);
 }
 
 }  // namespace

@@ -16,13 +16,15 @@ class QueryTest : public CommandTest {
     Policy("domains/appDom", "-s open grant\n-r /usr rx\n");
   }
 
-  void SetUp() override {
+  void SetUp() override { MakeHost({{"base.tar", Base()}}); }
+
+  [[nodiscard]] static StandIn::Archive Base() {
     StandIn::Archive base;
     base.Directory("etc").File("etc/hosts", "").File("etc/shadow", "");
     base.Directory("etc/net").File("etc/net/a", "").File("etc/net/b", "");
     base.Symlink("etc/net/link", "a");
     base.Directory("usr/bin").File("usr/bin/ls", "").Symlink("bin", "usr/bin");
-    MakeHost({{"base.tar", base}});
+    return base;
   }
 
   // The verb with the test's host.

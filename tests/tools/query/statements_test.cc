@@ -30,8 +30,9 @@ Vocabulary StatementWords() {
 }
 
 StatementFile Parse(const std::string& text) {
-  return ParseStatements(ReadPolicyText(text), StatementWords(),
-                         [](const std::string& path) { return path; });
+  return ParseStatements(ReadPolicyText(text), StatementWords(), [](const std::string& path) {
+    return StandIn::FileObject{path, std::nullopt};
+  });
 }
 
 TestRun RunOf(const Policy& policy, const std::string& text) {
