@@ -27,7 +27,8 @@ class SavedModule {
     std::istringstream stream(line);
     std::string keyword;
     stream >> keyword;
-    const auto& info = *StandIn::FindRuleType(keyword);
+    const auto& info =
+        ZekCtl::Security::InfoOf(*ZekCtl::Security::TypeOfKeyword(keyword));
     StandIn::Rule rule;
     std::string word;
     while (rule.words.size() < info.wordCount && stream >> word) rule.words.push_back(word);
