@@ -27,8 +27,7 @@ class SavedModule {
     std::istringstream stream(line);
     std::string keyword;
     stream >> keyword;
-    const auto& info =
-        ZekCtl::Security::InfoOf(*ZekCtl::Security::TypeOfKeyword(keyword));
+    const auto& info = ZekCtl::Security::InfoOf(*ZekCtl::Security::TypeOfKeyword(keyword));
     StandIn::Rule rule;
     std::string word;
     while (rule.words.size() < info.wordCount && stream >> word) rule.words.push_back(word);

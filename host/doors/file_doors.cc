@@ -45,8 +45,6 @@ std::filebuf OpenPolicyFile(const std::string& path) {
   return file;
 }
 
-int OpenTardiskPolicyFile(const std::string& path) {
-  return Root().Open(path, O_RDONLY).Release();
-}
+int OpenTardiskPolicyFile(const std::string& path) { return Root().Open(path, O_RDONLY).Release(); }
 
 }  // namespace SecPolicy

@@ -40,10 +40,9 @@ class RootFiles final : public StandIn::CallerFiles {
 template <typename Call>
 long Ask(const Call& call) {
   const AttachedHost* host = StandIn::Attached();
-  const long result =
-      host == nullptr
-          ? -ENOSYS
-          : StandIn::AsCallResult([&] { return call(*host, RootFiles(host->files.Tree())); });
+  const long result = host == nullptr ? -ENOSYS : StandIn::AsCallResult([&] {
+    return call(*host, RootFiles(host->files.Tree()));
+  });
   if (result >= 0) return result;
   const auto number = static_cast<int>(-result);
   if (LibraryUse* use = LibraryUse::Current()) use->NoteFailure(number);
@@ -59,8 +58,7 @@ PrivateCallResult IssueSystemCall(long number, const PrivateCallArguments& argum
   StandIn::CallArguments widened{};
   std::copy(arguments.begin(), arguments.end(), widened.begin());
   StandIn::OwnMemory memory;
-  const StandIn::PrivateAnswer answer =
-      StandIn::AnswerPrivateCall(*host, number, widened, memory);
+  const StandIn::PrivateAnswer answer = StandIn::AnswerPrivateCall(*host, number, widened, memory);
   return {answer.status, answer.error};
 }
 

@@ -39,8 +39,7 @@ CallArguments ArgumentsOf(const TrappedCall& call) {
 void AnswerPrivate(const AttachedHost* host, TrappedCall& call) {
   if (host == nullptr) return call.SetResult(-ENOSYS);
   UserMemory memory;
-  const PrivateAnswer answer =
-      AnswerPrivateCall(*host, call.Number(), ArgumentsOf(call), memory);
+  const PrivateAnswer answer = AnswerPrivateCall(*host, call.Number(), ArgumentsOf(call), memory);
   call.SetResult(answer.status);
   call.SetSecondResult(answer.error);
 }

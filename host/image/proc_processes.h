@@ -6,8 +6,8 @@
 
 namespace StandIn {
 
-// Reads /proc through a descriptor, so that it still can after a change of the root directory. Where
-// there is no /proc, start times are unknown, and a process is told by its id alone.
+// Reads /proc through a descriptor, so that it still can after a change of the root directory.
+// Where there is no /proc, start times are unknown, and a process is told by its id alone.
 class ProcProcesses final : public ProcessTable {
  public:
   ProcProcesses();

@@ -85,8 +85,8 @@ std::vector<RootIndex::Found> RootIndex::AllPaths() const {
 void RootIndex::LookUp(const Found& file, Files& files) const {
   const UniqueFd fd = OpenBeneath(tree_.Root(), std::string(file.path), O_PATH | O_NOFOLLOW);
   if (!fd.IsOpen() && (errno == EMFILE || errno == ENFILE || errno == ENOMEM)) {
-    throw ModuleError(errno, std::string("the files of the host cannot be looked up: ") +
-                                 std::strerror(errno));
+    throw ModuleError(
+        errno, std::string("the files of the host cannot be looked up: ") + std::strerror(errno));
   }
   struct stat status;
   if (fd.IsOpen() && ::fstat(fd.Get(), &status) == 0) files.byInode.emplace(status.st_ino, file);

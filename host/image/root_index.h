@@ -26,8 +26,7 @@ namespace StandIn {
 class RootIndex {
  public:
   // `root` is a descriptor of root/ (O_PATH will do).
-  RootIndex(ImageIndex index, UniqueFd root)
-      : image_(std::move(index)), tree_(std::move(root)) {}
+  RootIndex(ImageIndex index, UniqueFd root) : image_(std::move(index)), tree_(std::move(root)) {}
 
   // That of a host; nothing when the host has not been assembled. `readRest` is called as ReadImage
   // says. Throws HostError: "DIR/root: cannot be opened: REASON" and the errors of ReadImage.

@@ -13,8 +13,8 @@ struct BadArgument {
   int number;
 };
 
-// Access to addresses that a caller handed over. All throw BadArgument EFAULT for memory that cannot
-// be read or written, as far as that can be told.
+// Access to addresses that a caller handed over. All throw BadArgument EFAULT for memory that
+// cannot be read or written, as far as that can be told.
 class CallerMemory {
  public:
   struct Piece {

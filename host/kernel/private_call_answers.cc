@@ -54,8 +54,8 @@ FileRule ReadRecord(const Callee& callee, std::uint64_t address, WorldId world) 
   return {world, callee.memory.String(address, kPathBytes), permission};
 }
 
-std::vector<FileRule> ReadRecords(const Callee& callee, std::uint64_t address,
-                                  std::uint32_t count, WorldId world) {
+std::vector<FileRule> ReadRecords(const Callee& callee, std::uint64_t address, std::uint32_t count,
+                                  WorldId world) {
   std::vector<FileRule> rules;
   for (std::uint32_t i = 0; i < count; ++i) {
     rules.push_back(ReadRecord(callee, address + i * sizeof(ZekAccess_FileRule), world));
@@ -86,12 +86,14 @@ void DestroyDomain(const Callee& callee, const CallArguments& arguments) {
 
 void UpdateRule(const Callee& callee, const CallArguments& arguments) {
   const auto& [domain, path, permission, unused1, unused2, unused3] = arguments;
-  callee.module.UpdateFileRule(ToDomain(domain), callee.memory.String(path, kPathBytes), ToUnsigned(permission));
+  callee.module.UpdateFileRule(ToDomain(domain), callee.memory.String(path, kPathBytes),
+                               ToUnsigned(permission));
 }
 
 void RemoveRule(const Callee& callee, const CallArguments& arguments) {
   const auto& [world, domain, path, unused1, unused2, unused3] = arguments;
-  callee.module.RemoveFileRule(ToWorld(world), ToDomain(domain), callee.memory.String(path, kPathBytes));
+  callee.module.RemoveFileRule(ToWorld(world), ToDomain(domain),
+                               callee.memory.String(path, kPathBytes));
 }
 
 void CountRules(const Callee& callee, const CallArguments& arguments) {

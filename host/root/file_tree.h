@@ -44,9 +44,7 @@ class FileTree {
   // The type of the file, S_IFREG and so on; 0 where there is none. A link is not followed.
   [[nodiscard]] mode_t LinkType(const std::string& path) const;
   [[nodiscard]] bool IsDirectory(const std::string& path) const;
-  [[nodiscard]] bool Exists(const std::string& path) const {
-    return Open(path, O_PATH).IsOpen();
-  }
+  [[nodiscard]] bool Exists(const std::string& path) const { return Open(path, O_PATH).IsOpen(); }
 
  private:
   FileTree() = default;

@@ -17,8 +17,7 @@ namespace {
 
 class OpenFile {
  public:
-  explicit OpenFile(const std::string& path)
-      : descriptor_(OpenTardiskPolicyFile(path)) {
+  explicit OpenFile(const std::string& path) : descriptor_(OpenTardiskPolicyFile(path)) {
     if (descriptor_ < 0) throw TavonException("Unable to open policy file " + path);
   }
   ~OpenFile() { close(descriptor_); }

@@ -101,7 +101,8 @@ TEST_F(BadDiskTest, ReadOnlyDisk) {
 }
 
 TEST_F(BadDiskTest, FileSizeLimit) {
-  ExpectRefused(LoadAfter(LimitFileSize), Host() + "/kernel.json: cannot be written: File too large");
+  ExpectRefused(LoadAfter(LimitFileSize),
+                Host() + "/kernel.json: cannot be written: File too large");
   ExpectUsable();
 }
 

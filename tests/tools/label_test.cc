@@ -166,9 +166,8 @@ const char kTooManyOpenFiles[] =
 TEST_F(DeepTreeTest, LimitOfOpenFilesIsNamedWhereItEndsTheLabelling) {
   const Result result = WithFewFiles({"label", "set", "--host", Host(), "-R", "/deep", "conf"});
   EXPECT_EQ(result.status, 1);
-  EXPECT_THAT(result.Errors(),
-              ElementsAre(ContainsRegex("^Error: Unable to .* /deep/d/d/d/"),
-                          std::string("Error: ") + kTooManyOpenFiles));
+  EXPECT_THAT(result.Errors(), ElementsAre(ContainsRegex("^Error: Unable to .* /deep/d/d/d/"),
+                                           std::string("Error: ") + kTooManyOpenFiles));
 }
 
 TEST_F(DeepTreeTest, LimitOfOpenFilesIsNamedOnceByALoad) {

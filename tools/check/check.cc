@@ -73,8 +73,9 @@ CheckReport CheckAfter(StandIn::LoadEnd end, ErrorList& errors, const PolicyFile
   const LoadErrors load(std::exchange(errors.Errors(), {}));
   WordJudge judge(module);
   References references;
-  CheckContext context{module, kernel.Files(), load, errors.Shortages(), end == StandIn::LoadEnd::kTerminated,
-                       judge,  findings,       references};
+  CheckContext context{
+      module, kernel.Files(), load,      errors.Shortages(), end == StandIn::LoadEnd::kTerminated,
+      judge,  findings,       references};
   references.objects.insert(module.Tardisk(StandIn::TardiskWord::kDefaultLabel));
   CheckDomainNames(policy.domains, context);
   for (const CheckedFile& file : policy.domains.files) CheckDomainFile(file, context);

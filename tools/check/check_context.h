@@ -29,7 +29,7 @@ struct CheckContext {
   const StandIn::RootIndex& root;   // the host's files
   const LoadErrors& load;
   const std::set<std::string>& shortages;  // errors of the load for want of descriptors
-  bool isTerminated;  // the load, before it came to tardisks and file labels
+  bool isTerminated;                       // the load, before it came to tardisks and file labels
   WordJudge& judge;
   Findings& findings;
   References& references;

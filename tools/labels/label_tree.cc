@@ -22,7 +22,7 @@ bool IsLabelled(mode_t type) {
 }
 
 mode_t TypeOfEntry(const FileTree& root, const std::string& path,
-              const SecPolicy::DirectoryEntry& entry) {
+                   const SecPolicy::DirectoryEntry& entry) {
   return entry.type == DT_UNKNOWN ? root.LinkType(path) : DTTOIF(entry.type);
 }
 

@@ -88,8 +88,8 @@ Policy HeldPolicy(Kernel& kernel) {
 }
 
 Policy HeldPolicy(HostDirectory host) {
-  Kernel kernel(std::move(host), {.state = KernelOptions::State::kSnapshot,
-                       .root = KernelOptions::Root::kOptional});
+  Kernel kernel(std::move(host),
+                {.state = KernelOptions::State::kSnapshot, .root = KernelOptions::Root::kOptional});
   return HeldPolicy(kernel);
 }
 

@@ -19,8 +19,8 @@ struct LabelLine {
 
 class LabelLines {
  public:
-  // Reads the directory "fileLabels" of `files`. The links of `root`, the host's, decide which files
-  // the lines name. Lines that a load would not take are left out.
+  // Reads the directory "fileLabels" of `files`. The links of `root`, the host's, decide which
+  // files the lines name. Lines that a load would not take are left out.
   LabelLines(const PolicyFiles& files, const StandIn::FileTree& root);
 
   // The last line that labels the file at `path`, an absolute path without links; with `label`, the

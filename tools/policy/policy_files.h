@@ -13,8 +13,8 @@ inline constexpr char kSystemPolicyDir[] = "/etc/olvane/secpolicy";
 // Where every load reads the policy of the tardisks, whatever directory it is given.
 inline constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
 
-// A policy directory: the tree that it lies in, its path there, and what its user calls it. The tree
-// has to live as long as this object.
+// A policy directory: the tree that it lies in, its path there, and what its user calls it. The
+// tree has to live as long as this object.
 struct PolicyFiles {
   const StandIn::FileTree& tree;
   std::string path;

@@ -9,9 +9,9 @@
 namespace SecPolicyTool {
 
 struct PolicyPath {
-  std::string path;  // absolute
-  bool isOnMachine;  // else in the host's root
-  std::string shown; // what its user calls it, without slashes at its end
+  std::string path;   // absolute
+  bool isOnMachine;   // else in the host's root
+  std::string shown;  // what its user calls it, without slashes at its end
 
   // Its files; those of the host are the kernel's.
   [[nodiscard]] PolicyFiles Files(StandIn::Kernel& kernel) const {

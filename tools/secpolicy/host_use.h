@@ -9,8 +9,8 @@
 
 namespace SecPolicyTool {
 
-// What a verb does with a kernel that the library works on. What the library logs goes to the system
-// log.
+// What a verb does with a kernel that the library works on. What the library logs goes to the
+// system log.
 using HostWork = std::function<ExitStatus(StandIn::Kernel&)>;
 
 // Does `work` with what the kernel of the host `dir` (see OpenHost) holds now. Writes nothing.
