@@ -2,13 +2,11 @@
 
 #include <algorithm>
 
+#include "tools/policy/counted.h"
+
 namespace SecPolicyTool {
 
 namespace {
-
-std::string Counted(std::size_t count, const char* one, const char* more) {
-  return std::to_string(count) + " " + (count == 1 ? one : more);
-}
 
 void CheckLength(const CheckedFile& file, const PolicyLine& line, Findings& findings) {
   if (line.whole.size() <= kLongestLine) return;
@@ -16,8 +14,8 @@ void CheckLength(const CheckedFile& file, const PolicyLine& line, Findings& find
   findings.AddWarning(Kind::kLongLine, SpotAt(file, line, kLongestLine + 1, cut),
                       "the line has " + std::to_string(line.whole.size()) +
                           " bytes, of which a load reads 1023; ignored are the last " +
-                          Counted(cut, "byte", "bytes") + " and " +
-                          Counted(file.text.hiddenLines, "line", "lines") + " below",
+                          Counted(cut, "byte") + " and " + Counted(file.text.hiddenLines, "line") +
+                          " below",
                       "break the line up, or put its comment on lines of its own");
 }
 

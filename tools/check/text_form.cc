@@ -2,14 +2,11 @@
 
 #include "tools/check/line_excerpt.h"
 #include "tools/check/report_forms.h"
+#include "tools/policy/counted.h"
 
 namespace SecPolicyTool {
 
 namespace {
-
-std::string Counted(std::size_t count, const char* what) {
-  return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
-}
 
 TerminalText PlaceInFront(const Place& place) {
   return place.file.empty() ? "" : PlaceText(place) + ": ";

@@ -4,6 +4,7 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
+#include "tools/policy/counted.h"
 #include "tools/policy/policy_json.h"
 #include "tools/policy/unknown_word.h"
 
@@ -24,10 +25,6 @@ std::string RuleLine(const TransitionGraph& graph, const Transition& transition)
 
 TerminalText Name(const TransitionGraph& graph, std::size_t domain) {
   return graph.Domains()[domain];
-}
-
-std::string Counted(std::size_t count, const char* what) {
-  return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
 }
 
 // A step's rules, a line for each, aligned among one another.

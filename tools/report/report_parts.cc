@@ -67,10 +67,6 @@ Html PlaceHtml(const std::optional<Place>& place, const std::string& file) {
   return Element("small", PlaceText(shown));
 }
 
-std::string Counted(std::size_t count, const std::string& what) {
-  return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
-}
-
 Html Section(const char* id, const std::string& title, Html content) {
   const std::string heading = std::string(id) + "-title";
   Html whole = Element("h2", {{"id", heading}}, title);

@@ -5,6 +5,7 @@
 #include <string>
 
 #include "tools/graph/transition_graph.h"
+#include "tools/policy/counted.h"
 #include "tools/policy/policy.h"
 #include "tools/report/html.h"
 
@@ -40,9 +41,6 @@ bool IsLabel(RuleType type, std::size_t word);
 
 // A place, set apart; one within `file` by its line alone.
 Html PlaceHtml(const std::optional<Place>& place, const std::string& file = "");
-
-// "1 rule", "2 rules".
-std::string Counted(std::size_t count, const std::string& what);
 
 // A section with a heading and what it holds.
 Html Section(const char* id, const std::string& title, Html content);
