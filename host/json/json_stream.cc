@@ -106,9 +106,10 @@ class ValueBuilder {
   bool Uint(unsigned int value) { return Scalar(value); }
   bool Int64(std::int64_t value) { return Scalar(value); }
   bool Uint64(std::uint64_t value) { return Scalar(value); }
-  bool Double(double value) { return Scalar(value) && std::isfinite(value); }
+  bool Double(double value) { return std::isfinite(value) && Scalar(value); }
   bool String(const char* bytes, std::size_t size, bool) {
     const std::string_view text(bytes, size);
+    if (!IsUtf8(text)) return false;
     json& value = NewValue();
     if (value.is_string()) {
       value.get_ref<std::string&>().assign(text);
@@ -116,7 +117,7 @@ class ValueBuilder {
       Replace(value, std::string(text));
     }
     EndValue();
-    return IsUtf8(text);
+    return true;
   }
   bool RawNumber(const char*, std::size_t, bool) { return false; }  // never called
 
@@ -128,11 +129,12 @@ class ValueBuilder {
     return true;
   }
   bool Key(const char* bytes, std::size_t size, bool) {
-    limits_.Check(open_.size());
     std::string& key = open_.back().key;
     key.assign(bytes, size);
+    if (!IsUtf8(key)) return false;
+    limits_.Check(open_.size());
     limits_.Key(key);
-    return IsUtf8(key);
+    return true;
   }
   bool EndObject(std::size_t) {
     limits_.EndObject();

@@ -40,7 +40,8 @@ namespace StandIn {
 // Hands the text over in parts: the same text for the same contents. Throws what `sink` throws.
 void WriteState(const ModuleState& state, const TextSink& sink);
 
-// What `text`, the content of `file`, says. Words of rules need not stand in the description's
+// What `text`, the content of `file`, says. It is read twice, in blocks; no more of it is kept than
+// what is not a rule or the label of a file. Words of rules need not stand in the description's
 // lists; worlds of file rules need not be known; labels of files may have been removed; predefined
 // labels that are missing are defined. HostError with file and place for anything else that a
 // module of this description could not hold.

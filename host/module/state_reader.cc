@@ -234,7 +234,7 @@ void ReadRows(const TextReader& text, const std::string& file, std::uint32_t fil
               const std::vector<DomainId>& domains, ModuleState& state) {
   const LabelId next = state.labels[static_cast<std::size_t>(LabelType::kObject)].Held().next;
   const auto domainOf = [&](const JsonCursor& place, std::span<const std::size_t> indexes) {
-    if (indexes[0] >= domains.size()) place.Fail("was not there a moment ago");
+    if (indexes[0] >= domains.size()) place.Fail("was added while the file was read");
     return domains[indexes[0]];
   };
   std::vector<JsonArrays> rows = Rows();

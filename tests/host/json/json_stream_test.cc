@@ -116,6 +116,14 @@ TEST_F(JsonStreamTest, AnElementHoldsNothingOfTheOneBefore) {
   EXPECT_EQ(taken, rows);
 }
 
+TEST_F(JsonStreamTest, AnElementThatIsNoJsonIsNotHandedOver) {
+  for (const char* text : {R"(["a", "\udc00"])", R"(["a", 10e308])", R"(["a", ["b"})"}) {
+    elements_.clear();
+    EXPECT_NE(ErrorOf([&] { Parse({{}}, text); }), "(nothing was thrown)");
+    EXPECT_THAT(elements_, ElementsAre("a.json: /0: here 0")) << text;
+  }
+}
+
 TEST_F(JsonStreamTest, PlacesAreEscaped) {
   Parse({{"a\n/", "*", "rows"}}, R"({"a\n/": [{"rows": [1]}]})");
   EXPECT_THAT(elements_, ElementsAre(R"(a.json: /a\x0a~1/0/rows/0: here 0 0)"));

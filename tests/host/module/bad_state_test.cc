@@ -233,7 +233,7 @@ TEST_F(BadStateTest, ATextThatGrowsWhileItIsRead) {
     return ReaderOf(beginnings == 1 ? before : after)(offset, into);
   };
   EXPECT_EQ(HostErrorOf([&] { module_.Restore(text, "kernel.json"); }),
-            "kernel.json: /domains/0/rules/0: was not there a moment ago");
+            "kernel.json: /domains/0/rules/0: was added while the file was read");
 }
 
 }  // namespace
