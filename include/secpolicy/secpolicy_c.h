@@ -15,25 +15,16 @@
  * Strings are UTF-8 and end at their NUL byte; an argument with other bytes is refused. Bytes of
  * policy files that are not UTF-8 appear as U+FFFD in results. Positions in lines are in bytes.
  *
- * The calling process stays as it was. To work in a host means to change the root directory and to
- * install a system-call filter, which cannot be undone; so each call does its work in a child
- * process, and waits for it. That child has no descriptors but its own, no signal handlers, and
- * standard streams that lead nowhere; it runs none of what the caller registered for fork's or
- * exit's sake, apart from handlers of pthread_atfork. Nothing is written to the caller's standard
- * output or error. SIGCHLD may be ignored or handled, and other code may wait for all children: the
- * caller gets that signal for the child as for any other.
+ * The calling process stays as it was. A host's kernel is an object in the caller's process and
+ * thread: no child is made, and root directory, namespaces, filters, signal handlers, descriptors and
+ * standard streams are not touched. Nothing is written to standard output or error; what a load logs
+ * goes to the system log under the caller's own name. A write beyond the limit of file sizes fails
+ * the call and raises no signal.
  *
  * Threads. All functions may be called from several threads at once. A handle may be used by
  * several of them, but for its being freed. A call blocks its thread, which cannot be cancelled
- * meanwhile. Two loads of one host take turns. In a process with several threads the child inherits
- * their locks as they are at that moment. The C library hands its own over free, but for those of
- * the system log, of time zones, of locales and of the list of loaded libraries; a child that finds
- * one of these taken is given up, and another made: a call is some tens of milliseconds later then.
- * This covers no locks of replacements for the C library's functions, such as an allocator without
- * handlers for fork.
- *
- * Not for processes that have entered a host themselves (secpolicy/host/entered_host.h), or whose
- * own system-call filter forbids what entering one needs. */
+ * meanwhile. Two loads of one host take turns; one that waits for another process for more than 30
+ * seconds fails and names that process. */
 #ifndef SECPOLICY_SECPOLICY_C_H
 #define SECPOLICY_SECPOLICY_C_H
 
@@ -70,7 +61,7 @@ typedef enum secpolicy_status {
    * of the wrong form, a bad pattern. */
   SECPOLICY_BAD_REQUEST = 2,
   /* The host directory or the policy directory does not allow it: it is missing, damaged, not
-   * assembled, not readable, or cannot be entered by this user. */
+   * assembled, not or not readable by this user. */
   SECPOLICY_FAILED = 3,
   /* The load was done to its end, and reported errors. */
   SECPOLICY_LOAD_FAILED = 4,
@@ -78,7 +69,7 @@ typedef enum secpolicy_status {
   SECPOLICY_LOAD_TERMINATED = 5,
   /* There is no memory. */
   SECPOLICY_OUT_OF_MEMORY = 6,
-  /* The child process could not be made, or came to no end of its own. */
+  /* The system failed in a way that no other status names. */
   SECPOLICY_SYSTEM = 7,
   /* None. Any number may be asked for its name. */
   SECPOLICY_STATUS_RANGE = INT32_MAX
