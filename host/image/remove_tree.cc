@@ -7,7 +7,7 @@
 #include <cstdio>
 #include <vector>
 
-#include "host/image/beneath.h"
+#include "host/root/beneath.h"
 #include "host/image/system_failure.h"
 #include "host/image/unique_fd.h"
 

@@ -8,7 +8,7 @@
 #include <cstring>
 #include <utility>
 
-#include "host/image/beneath.h"
+#include "host/root/beneath.h"
 #include "host/image/image_file.h"
 #include "host/module/module_error.h"
 #include "secpolicy/host/host_error.h"

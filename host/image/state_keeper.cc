@@ -9,8 +9,10 @@
 
 namespace StandIn {
 
-StateKeeper::StateKeeper(StateFile& file, std::string path, SimulatedModule& module)
-    : file_(file), path_(std::move(path)), module_(module), initial_(module.Save()) {}
+StateKeeper::StateKeeper(StateFile& file, std::string path, StorableModule& module)
+    : file_(file), path_(std::move(path)), module_(module) {
+  module_.Save([this](std::string_view part) { initial_ += part; });
+}
 
 void StateKeeper::Refresh() {
   if (file_.CurrentVersion() == version_) return;

@@ -5,7 +5,7 @@
 #include <string>
 
 #include "host/image/state_file.h"
-#include "host/module/simulated_module.h"
+#include "host/module/storable_module.h"
 #include "host/trace/operation_point.h"
 
 namespace StandIn {
@@ -18,7 +18,7 @@ class StateKeeper final : public OperationHook {
  public:
   // `file` and `module` must outlive this object; `path` is what messages call the file. What
   // `module` holds now is what it holds when there is no file.
-  StateKeeper(StateFile& file, std::string path, SimulatedModule& module);
+  StateKeeper(StateFile& file, std::string path, StorableModule& module);
 
   // Takes over what the file holds. Throws HostError when it is damaged or cannot be read.
   void Refresh();
@@ -39,7 +39,7 @@ class StateKeeper final : public OperationHook {
 
   StateFile& file_;
   std::string path_;
-  SimulatedModule& module_;
+  StorableModule& module_;
   std::string initial_;
   std::optional<StateFile::Version> version_;
   std::optional<StateFile::Lock> batch_;

@@ -6,7 +6,7 @@
 #include <cerrno>
 #include <utility>
 
-#include "host/image/beneath.h"
+#include "host/root/beneath.h"
 #include "host/image/entry_path.h"
 #include "host/image/system_failure.h"
 

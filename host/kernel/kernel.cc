@@ -28,16 +28,16 @@ RootIndex FilesOf(const HostDirectory& host, const KernelOptions& options,
 Kernel::Kernel(HostDirectory host, const KernelOptions& options)
     : host_(std::move(host)),
       isKept_(options.state == KernelOptions::State::kKept),
-      module_(DescriptionOf(host_), processes_),
+      module_(StartModule(DescriptionOf(host_), processes_)),
       file_(host_),
-      keeper_(file_, host_.Ref().PathOf(kStateFile), module_),
+      keeper_(file_, host_.Ref().PathOf(kStateFile), *module_),
       trace_(options.trace),
-      observed_(module_, point_),
+      observed_(*module_, point_),
       files_(FilesOf(host_, options,
                      [&] {
                        if (options.state != KernelOptions::State::kScratch) keeper_.Refresh();
                      })),
-      attached_{observed_, point_, module_, files_} {
+      attached_{observed_, point_, *module_, files_} {
   for (const Fault& fault : options.faults) faults_.Add(fault);
   // The lock is held around everything; a fault is traced as the refusal that it stands for. What
   // has nothing to do would cost every operation a little.

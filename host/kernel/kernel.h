@@ -1,6 +1,7 @@
 // The kernel of a host, as an object.
 #pragma once
 
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>
@@ -11,7 +12,7 @@
 #include "host/image/root_index.h"
 #include "host/image/state_file.h"
 #include "host/image/state_keeper.h"
-#include "host/module/simulated_module.h"
+#include "host/module/storable_module.h"
 #include "host/trace/fault_plan.h"
 #include "host/trace/observed_module.h"
 #include "host/trace/trace_log.h"
@@ -45,8 +46,10 @@ class Kernel {
   // The module as programs use it: every operation is traced, kept, and refused on request.
   [[nodiscard]] SecurityModule& Module() noexcept { return observed_; }
   // The module itself, for questions that are no operations of a program.
-  [[nodiscard]] SecurityModule& Unobserved() noexcept { return module_; }
+  [[nodiscard]] SecurityModule& Unobserved() noexcept { return *module_; }
+  // An empty root where the host has not been assembled.
   [[nodiscard]] RootIndex& Files() noexcept { return files_; }
+  [[nodiscard]] bool IsAssembled() const noexcept { return files_.Tree().Root() >= 0; }
   [[nodiscard]] const AttachedHost& Attachment() const noexcept { return attached_; }
 
   // From here to Commit, operations are kept together; see StateKeeper. Nothing is done where
@@ -60,7 +63,7 @@ class Kernel {
   HostDirectory host_;
   bool isKept_;
   ProcProcesses processes_;
-  SimulatedModule module_;
+  std::unique_ptr<StorableModule> module_;
   StateFile file_;
   StateKeeper keeper_;
   TraceLog trace_;

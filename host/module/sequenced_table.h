@@ -48,19 +48,6 @@ class SequencedTable {
     return true;
   }
 
-  // Erases every record that `matches` is true for; gives their number.
-  template <typename Predicate>
-  std::size_t EraseIf(Predicate matches) {
-    const std::size_t before = records_.size();
-    for (auto place = records_.begin(); place != records_.end();) {
-      const auto current = place++;
-      if (matches(std::as_const(*current))) {
-        Erase(KeyOf(*current));
-      }
-    }
-    return before - records_.size();
-  }
-
   // Lets `change` give the record at `key`, which must be there, another key; a record that has
   // that one already is erased. The record keeps its place in the order.
   template <typename Change>

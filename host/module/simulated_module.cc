@@ -32,6 +32,11 @@ SimulatedModule::SimulatedModule(ModuleDescription description, const ProcessTab
   }
 }
 
+std::unique_ptr<StorableModule> StartModule(ModuleDescription description,
+                                            const ProcessTable& processes) {
+  return std::make_unique<SimulatedModule>(std::move(description), processes);
+}
+
 void SimulatedModule::Save(const TextSink& sink) const { WriteState(*state_, sink); }
 
 std::string SimulatedModule::Save() const {

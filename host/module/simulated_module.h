@@ -9,11 +9,8 @@
 #include <unordered_map>
 #include <vector>
 
-#include "host/json/text_reader.h"
-#include "host/module/module_description.h"
 #include "host/module/module_state.h"
-#include "host/module/process_table.h"
-#include "host/module/security_module.h"
+#include "host/module/storable_module.h"
 #include "host/module/word_lists.h"
 
 namespace StandIn {
@@ -22,19 +19,15 @@ namespace StandIn {
 // no label type, word list or type of rule is refused with EINVAL. When memory runs out, a list
 // that was to be added, removed or renamed is done in part; every other operation is not done at
 // all.
-class SimulatedModule final : public SecurityModule {
+class SimulatedModule final : public StorableModule {
  public:
-  // `processes` must outlive the module. The description is one that ReadDescription gives, or as
-  // good. ModuleError when a predefined label's name will not do or there are too many.
+  // As StartModule.
   SimulatedModule(ModuleDescription description, const ProcessTable& processes);
 
-  // What the module holds, as JSON text: the same for the same contents. state_json.h says its
-  // shape. A sink gets it in parts of some 64 KiB, and may throw.
-  void Save(const TextSink& sink) const;
+  void Save(const TextSink& sink) const override;
+  void Restore(const TextReader& text, const std::string& file) override;
+  // The same with whole texts.
   [[nodiscard]] std::string Save() const;
-  // Takes over what another module of a like description saved to `file`. HostError, and everything
-  // is as it was, when `text` is not such or does not fit the description.
-  void Restore(const TextReader& text, const std::string& file);
   void Restore(const std::string& text, const std::string& file);
 
   std::optional<DomainId> FindDomain(const std::string& name) override;

@@ -3,14 +3,13 @@
 #include <fcntl.h>
 #include <linux/openat2.h>
 #include <sys/stat.h>
-#include <sys/syscall.h>
-#include <unistd.h>
 
 #include <cerrno>
 #include <cstdlib>
 #include <filesystem>
 #include <memory>
 
+#include "host/root/openat2.h"
 #include "host/root/path_walk.h"
 
 namespace StandIn {
@@ -18,11 +17,7 @@ namespace StandIn {
 namespace {
 
 UniqueFd OpenInRoot(int rootFd, const std::string& path, int flags, std::uint64_t resolve) {
-  struct open_how how {};
-  how.flags = static_cast<__u64>(flags | O_CLOEXEC);
-  how.resolve = RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS | resolve;
-  // The C library has no function for this call.
-  return UniqueFd(static_cast<int>(::syscall(SYS_openat2, rootFd, path.c_str(), &how, sizeof how)));
+  return Openat2(rootFd, path, flags, RESOLVE_IN_ROOT | RESOLVE_NO_MAGICLINKS | resolve);
 }
 
 // Whether the call, and not the path, is what failed: an older kernel or emulator does not have it,

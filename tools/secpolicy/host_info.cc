@@ -2,12 +2,8 @@
 #include <iostream>
 #include <memory>
 
-#include "host/image/host_directory.h"
-#include "host/image/proc_processes.h"
-#include "host/image/root_index.h"
-#include "host/image/state_keeper.h"
+#include "host/kernel/kernel.h"
 #include "host/module/description_json.h"
-#include "host/module/simulated_module.h"
 #include "tools/policy/terminal.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"
@@ -18,13 +14,12 @@ using namespace StandIn;
 
 namespace {
 
-void PrintImage(const HostDirectory& host) {
-  const auto text = ReadFileIfThere(host.Ref(), kIndexFile);
-  if (!text) {
+void PrintImage(Kernel& kernel) {
+  if (!kernel.IsAssembled()) {
     std::cout << "Image: not assembled\n";
     return;
   }
-  const ImageIndex index = ParseImageIndex(*text, host.Ref().PathOf(kIndexFile));
+  const ImageIndex& index = kernel.Files().Image();
   std::cout << "Image: " << index.tardisks.size() << " tardisks\n";
   for (const TardiskContent& tardisk : index.tardisks) {
     PrintLine(std::cout,
@@ -33,7 +28,7 @@ void PrintImage(const HostDirectory& host) {
 }
 
 // The number of the domain's rules of each type that it has any of.
-void PrintDomain(SimulatedModule& module, DomainId domain) {
+void PrintDomain(SecurityModule& module, DomainId domain) {
   const auto info = module.GetDomainInfo(domain);
   if (!info) return;
   std::string line = "  " + std::to_string(domain) + " " + info->name + ":";
@@ -49,25 +44,22 @@ void PrintDomain(SimulatedModule& module, DomainId domain) {
   PrintLine(std::cout, rules == 0 ? line + " no rules" : line);
 }
 
-void PrintKernel(const HostDirectory& host, const ModuleDescription& description) {
-  const ProcProcesses processes;
-  SimulatedModule module(description, processes);
-  StateFile file(host);
-  StateKeeper keeper(file, host.Ref().PathOf(kStateFile), module);
-  keeper.Refresh();
+void PrintKernel(SecurityModule& module) {
   std::cout << "Objects: " << module.Words(WordList::kObjects).size() << "\nDomains:\n";
   for (DomainId domain = 0; domain < module.MaxDomains(); ++domain) PrintDomain(module, domain);
 }
 
-void PrintInfo(const HostDirectory& host) {
-  const ModuleDescription description =
-      ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile));
+void PrintInfo(const std::string& dir) {
+  Kernel kernel(HostDirectory(dir),
+                {.state = KernelOptions::State::kSnapshot, .root = KernelOptions::Root::kOptional});
+  const HostDirectory& host = kernel.Directory();
+  const ModuleLimits limits =
+      ReadDescription(host.DescriptionText(), host.Ref().PathOf(kDescriptionFile)).limits;
   PrintLine(std::cout, "Host: " + host.Path());
-  std::cout << "Limits: " << description.limits.domains << " domains, " << description.limits.labels
-            << " labels of each type, " << description.limits.fileRulesPerDomain
-            << " file rules a domain\n";
-  PrintImage(host);
-  PrintKernel(host, description);
+  std::cout << "Limits: " << limits.domains << " domains, " << limits.labels
+            << " labels of each type, " << limits.fileRulesPerDomain << " file rules a domain\n";
+  PrintImage(kernel);
+  PrintKernel(kernel.Unobserved());
 }
 
 }  // namespace
@@ -78,7 +70,7 @@ CommandLine HostInfoVerb() {
           .description = "Say what a host is made of and what its kernel holds",
           .operands = {HostOperand(*dir, "The host directory")},
           .run = [dir] {
-            PrintInfo(HostDirectory(*dir));
+            PrintInfo(*dir);
             return kDone;
           }};
 }

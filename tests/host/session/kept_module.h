@@ -6,6 +6,7 @@
 #include "host/image/proc_processes.h"
 #include "host/image/state_keeper.h"
 #include "host/module/description_json.h"
+#include "host/module/simulated_module.h"
 #include "host/trace/observed_module.h"
 #include "tests/host/image/host_fixture.h"
 
