@@ -173,9 +173,13 @@ constexpr RuleTypeInfo RuleInfo(const RuleRow<Record>& row) {
   return info;
 }
 
+// The entries of all rows, in their order.
+constexpr std::array<RuleTypeInfo, std::tuple_size_v<decltype(kRuleRows)>> RuleInfos() {
+  return std::apply([](const auto&... rows) { return std::array{RuleInfo(rows)...}; }, kRuleRows);
+}
+
 // All types without their records, by RuleType.
-inline constexpr std::array kRuleTypes =
-    std::apply([](const auto&... rows) { return std::array{RuleInfo(rows)...}; }, kRuleRows);
+inline constexpr auto kRuleTypes = RuleInfos();
 
 // The entry of a type, which must be one of the enumerators.
 constexpr const RuleTypeInfo& InfoOf(RuleType type) {

@@ -204,14 +204,16 @@ TEST_F(TerminalOutputTest, MembersOfDocumentsAreNamedEscapedAndWhole) {
   const std::string shown = "a\\x00b\\x1b\\xc2\\x9b\\xe2\\x80\\xae";
   for (const char* file : {"host.json", "kernel.json", "image.json"}) {
     const std::string path = Host() + "/" + file;
-    const std::string whole = fs::exists(path) ? StandIn::ReadBytes(path) : "";
+    fs::remove(path + ".kept");
+    if (fs::exists(path)) fs::rename(path, path + ".kept");
     StandIn::WriteBytes(path, "{\"format\": 1, \"" + key + "\": 1}");
     EXPECT_THAT(Command({"host", "info", Host()}).err,
                 HasSubstr(path + ": /" + shown + ": unknown member\n"));
     StandIn::WriteBytes(path, "{\"" + key + "\": 1, \"" + key + "\": 1}");
     EXPECT_EQ(Command({"host", "info", Host()}).err,
               "Error: " + path + ": gives the member \"" + shown + "\" of one object twice\n");
-    StandIn::WriteBytes(path, whole);
+    fs::remove(path);
+    if (fs::exists(path + ".kept")) fs::rename(path + ".kept", path);
   }
 }
 

@@ -74,6 +74,9 @@ class ThreadsTest(HostTest):
         self.assertEqual({result.errors for result in results}, {()})
 
     def test_other_threads_go_on_during_a_call(self):
+        # Enough lines for a call that takes longer than a switch between threads.
+        lines = "".join(f"-r /path/{number} r\n" for number in range(20000))
+        self.write("domains/many", lines)
         is_over = threading.Event()
         steps = 0
 
