@@ -9,7 +9,7 @@
 
 #include "bench/support/host_process.h"
 #include "bench/support/rules.h"
-#include "host/image/file_io.h"
+#include "host/files/file_io.h"
 #include "host/module/description_json.h"
 #include "host/module/simulated_module.h"
 #include "tests/support/memory_host.h"

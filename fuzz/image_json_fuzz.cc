@@ -1,7 +1,7 @@
 // The account of an assembled root: refused with HostError, or written as it was read.
 #include "fuzz/support/input.h"
 #include "fuzz/support/require.h"
-#include "host/image/image_index.h"
+#include "host/root/image_index.h"
 #include "secpolicy/host/host_error.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {

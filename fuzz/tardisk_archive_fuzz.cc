@@ -8,8 +8,8 @@
 #include "fuzz/support/input.h"
 #include "fuzz/support/require.h"
 #include "fuzz/support/scratch_directory.h"
-#include "host/image/remove_tree.h"
-#include "host/image/unpack.h"
+#include "host/root/remove_tree.h"
+#include "host/root/unpack.h"
 #include "secpolicy/host/host_error.h"
 #include "tests/support/memory_file.h"
 

@@ -4,8 +4,8 @@
 #include <string>
 #include <vector>
 
-#include "host/image/root_index.h"
 #include "host/module/security_module.h"
+#include "host/root/root_index.h"
 #include "host/trace/operation_point.h"
 
 namespace StandIn {

@@ -13,10 +13,10 @@
 
 #include "bench/support/allocations.h"
 #include "fuzz/support/scratch_directory.h"
-#include "host/image/assemble.h"
-#include "host/image/session.h"
 #include "host/module/description_json.h"
-#include "tests/host/image/archives.h"
+#include "host/root/assemble.h"
+#include "host/session/session.h"
+#include "tests/support/archives.h"
 
 namespace SecPolicyBench {
 

@@ -5,9 +5,9 @@
 #include "bindings/c/arguments.h"
 #include "bindings/c/barrier.h"
 #include "bindings/c/handles.h"
-#include "host/image/assemble.h"
-#include "host/image/host_directory.h"
 #include "host/module/description_json.h"
+#include "host/root/assemble.h"
+#include "host/state/host_directory.h"
 
 using SecPolicyC::Guarded;
 using SecPolicyC::PathOf;

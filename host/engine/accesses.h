@@ -11,8 +11,8 @@ namespace StandIn {
 inline constexpr char kCreateAccess[] = "create";
 inline constexpr char kConnectAccess[] = "connect";
 inline constexpr char kExecAccess[] = "exec";
-inline constexpr char kExecEvent[] = "exec";
-inline constexpr char kForkEvent[] = "fork";
+inline constexpr char kExecTransition[] = "exec";
+inline constexpr char kForkTransition[] = "fork";
 
 // The bit of kPermissionBits that allows the access: r covers read and getattr; w covers write,
 // append, create, delete, rename and setattr; x covers exec. Nothing for an access on which path

@@ -81,11 +81,12 @@ Verdict DecideCapability(const Subject& subject, const std::string& capability,
 }
 
 TransitionVerdict DecideExec(const Subject& subject, const FileObject& program) {
-  return WithTransition(subject, DecideAccess(subject, kExecAccess, program), program, kExecEvent);
+  return WithTransition(subject, DecideAccess(subject, kExecAccess, program), program,
+                        kExecTransition);
 }
 
 TransitionVerdict DecideFork(const Subject& subject, const FileObject& program) {
-  return WithTransition(subject, {true, false, std::nullopt}, program, kForkEvent);
+  return WithTransition(subject, {true, false, std::nullopt}, program, kForkTransition);
 }
 
 }  // namespace StandIn

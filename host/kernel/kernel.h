@@ -7,12 +7,12 @@
 #include <vector>
 
 #include "host/attached_host.h"
-#include "host/image/host_directory.h"
-#include "host/image/proc_processes.h"
-#include "host/image/root_index.h"
-#include "host/image/state_file.h"
-#include "host/image/state_keeper.h"
+#include "host/kernel/proc_processes.h"
 #include "host/module/storable_module.h"
+#include "host/root/root_index.h"
+#include "host/state/host_directory.h"
+#include "host/state/state_file.h"
+#include "host/state/state_keeper.h"
 #include "host/trace/fault_plan.h"
 #include "host/trace/observed_module.h"
 #include "host/trace/trace_log.h"

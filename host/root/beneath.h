@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 
 namespace StandIn {
 

@@ -9,7 +9,7 @@
 #include <string>
 #include <utility>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 
 namespace StandIn {
 

@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <string>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 
 namespace StandIn {
 

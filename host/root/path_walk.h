@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 
 namespace StandIn {
 

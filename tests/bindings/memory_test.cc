@@ -6,8 +6,8 @@
 #include <string>
 
 #include "secpolicy/secpolicy_c.h"
-#include "tests/host/image/temporary_directory.h"
 #include "tests/support/counted_memory.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

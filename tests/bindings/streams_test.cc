@@ -4,7 +4,7 @@
 #include <sstream>
 
 #include "secpolicy/secpolicy_c.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

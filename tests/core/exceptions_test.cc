@@ -4,7 +4,7 @@
 #include <type_traits>
 
 #include "secpolicy/secpolicy.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

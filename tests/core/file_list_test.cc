@@ -14,8 +14,8 @@
 #include "secpolicy/secpolicy.h"
 #include "tests/core/descriptors.h"
 #include "tests/core/directory_reads.h"
-#include "tests/host/image/temporary_directory.h"
 #include "tests/support/failing_allocations.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

@@ -3,7 +3,7 @@
 
 #include "secpolicy/secpolicy.h"
 #include "tests/core/words.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

@@ -6,9 +6,9 @@
 #include "secpolicy/secpolicy.h"
 #include "tests/core/descriptors.h"
 #include "tests/core/words.h"
-#include "tests/host/image/temporary_directory.h"
 #include "tests/support/counted_memory.h"
 #include "tests/support/failing_allocations.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

@@ -6,9 +6,9 @@
 #include <string>
 #include <vector>
 
-#include "tests/host/image/temporary_directory.h"
 #include "tests/support/memory_file.h"
 #include "tests/support/memory_host.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 

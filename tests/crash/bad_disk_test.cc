@@ -13,7 +13,7 @@
 
 #include "tests/crash/loading_host.h"
 #include "tests/crash/save_calls.h"
-#include "tests/host/image/child_process.h"
+#include "tests/support/child_process.h"
 
 namespace CrashTest {
 namespace {

@@ -11,12 +11,12 @@
 #include <map>
 #include <set>
 
-#include "host/image/assemble.h"
+#include "host/root/assemble.h"
 #include "secpolicy/host/host_error.h"
 #include "tests/crash/traced_process.h"
-#include "tests/host/image/archives.h"
-#include "tests/host/image/child_process.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/archives.h"
+#include "tests/support/child_process.h"
+#include "tests/support/temporary_directory.h"
 
 namespace CrashTest {
 namespace {

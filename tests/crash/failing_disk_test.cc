@@ -6,7 +6,7 @@
 #include <cerrno>
 
 #include "tests/host/module/module_fixture.h"
-#include "tests/host/session/kept_module.h"
+#include "tests/host/state/kept_module.h"
 
 namespace CrashTest {
 namespace {

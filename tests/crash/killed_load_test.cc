@@ -6,7 +6,7 @@
 #include <iostream>
 #include <stdexcept>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 #include "tests/crash/amount.h"
 #include "tests/crash/loading_host.h"
 #include "tests/crash/moments.h"

@@ -7,7 +7,7 @@
 #include <filesystem>
 #include <iostream>
 
-#include "host/image/session.h"
+#include "host/session/session.h"
 #include "secpolicy/secpolicy.h"
 #include "tests/crash/amount.h"
 #include "tests/crash/loading_host.h"

@@ -5,8 +5,8 @@
 
 #include <filesystem>
 
-#include "host/image/unique_fd.h"
-#include "tests/host/session/kept_module.h"
+#include "host/files/unique_fd.h"
+#include "tests/host/state/kept_module.h"
 
 namespace CrashTest {
 

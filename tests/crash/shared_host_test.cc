@@ -7,8 +7,8 @@
 #include "tests/crash/amount.h"
 #include "tests/crash/host_user.h"
 #include "tests/crash/shared_memory.h"
-#include "tests/host/session/kept_module.h"
 #include "tests/host/session/session_fixture.h"
+#include "tests/host/state/kept_module.h"
 
 namespace CrashTest {
 namespace {

@@ -5,7 +5,7 @@
 #include <sstream>
 
 #include "host/attached_host.h"
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 
 namespace SecPolicyTest {
 

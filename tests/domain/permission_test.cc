@@ -2,7 +2,7 @@
 #include <gtest/gtest.h>
 
 #include "domain/file_path_access_rules.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

@@ -9,7 +9,7 @@
 
 #include "tests/faults/campaign_hosts.h"
 #include "tests/faults/worker.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyFaults {
 

@@ -4,11 +4,11 @@
 #include <map>
 #include <set>
 
-#include "host/image/assemble.h"
-#include "host/image/host_directory.h"
 #include "host/module/description_json.h"
-#include "tests/host/image/archives.h"
-#include "tests/host/image/temporary_directory.h"
+#include "host/root/assemble.h"
+#include "host/state/host_directory.h"
+#include "tests/support/archives.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyFaults {
 

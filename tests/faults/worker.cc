@@ -5,8 +5,8 @@
 #include <algorithm>
 #include <cstdio>
 
-#include "host/image/session.h"
 #include "host/module/description_json.h"
+#include "host/session/session.h"
 #include "tests/faults/call_doors.h"
 #include "tests/faults/trial.h"
 

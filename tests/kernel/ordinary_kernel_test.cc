@@ -5,8 +5,8 @@
 #include <cerrno>
 
 #include "kernel/path_resolution.h"
-#include "tests/host/image/temporary_directory.h"
 #include "tests/kernel/kernel_calls.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 namespace {

@@ -6,7 +6,7 @@
 #include <sys/un.h>
 #include <unistd.h>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 #include "tests/labels/labels_fixture.h"
 #include "tests/support/file_system_answers.h"
 #include "tests/support/open_descriptors.h"

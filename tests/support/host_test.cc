@@ -9,10 +9,10 @@
 #include <iostream>
 #include <sstream>
 
-#include "host/image/assemble.h"
-#include "host/image/host_directory.h"
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 #include "host/module/description_json.h"
+#include "host/root/assemble.h"
+#include "host/state/host_directory.h"
 #include "tests/support/system_log.h"
 
 namespace SecPolicyTest {

@@ -10,11 +10,11 @@
 #include <type_traits>
 #include <vector>
 
-#include "host/image/session.h"
+#include "host/session/session.h"
 #include "host/trace/fault_plan.h"
 #include "secpolicy/secpolicy.h"
-#include "tests/host/image/archives.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/archives.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTest {
 

@@ -7,7 +7,7 @@
 #include <stdexcept>
 #include <string>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 
 namespace SecPolicyTest {
 

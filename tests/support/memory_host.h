@@ -4,8 +4,8 @@
 #include <string>
 
 #include "host/attached_host.h"
-#include "host/image/image_index.h"
 #include "host/module/simulated_module.h"
+#include "host/root/image_index.h"
 #include "host/trace/observed_module.h"
 #include "host/trace/operation_point.h"
 

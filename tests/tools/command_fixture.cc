@@ -10,8 +10,8 @@
 #include <sstream>
 #include <stdexcept>
 
-#include "host/image/file_io.h"
-#include "host/image/unique_fd.h"
+#include "host/files/file_io.h"
+#include "host/files/unique_fd.h"
 
 namespace SecPolicyTool {
 

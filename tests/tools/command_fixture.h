@@ -8,8 +8,8 @@
 #include <string>
 #include <vector>
 
-#include "tests/host/image/archives.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/archives.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTool {
 

@@ -5,7 +5,7 @@
 
 #include <filesystem>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 #include "tests/tools/command_fixture.h"
 
 namespace SecPolicyTool {

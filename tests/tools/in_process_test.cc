@@ -18,7 +18,7 @@
 #include <sstream>
 #include <thread>
 
-#include "tests/host/image/child_process.h"
+#include "tests/support/child_process.h"
 #include "tests/tools/command_fixture.h"
 
 namespace SecPolicyTool {

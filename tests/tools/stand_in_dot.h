@@ -6,7 +6,7 @@
 #include <optional>
 #include <string>
 
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTool {
 

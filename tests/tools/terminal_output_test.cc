@@ -10,7 +10,7 @@
 #include <regex>
 #include <stdexcept>
 
-#include "host/image/unique_fd.h"
+#include "host/files/unique_fd.h"
 #include "tests/tools/command_fixture.h"
 
 namespace SecPolicyTool {

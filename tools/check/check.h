@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "host/image/host_directory.h"
+#include "host/state/host_directory.h"
 #include "tools/check/finding.h"
 
 namespace SecPolicyTool {

@@ -7,8 +7,8 @@
 #include <unordered_map>
 #include <unordered_set>
 
-#include "host/image/root_index.h"
 #include "host/module/security_module.h"
+#include "host/root/root_index.h"
 #include "platform/tavon_exception.h"
 #include "tools/check/findings.h"
 #include "tools/check/load_errors.h"

@@ -9,8 +9,8 @@
 #include <string_view>
 #include <system_error>
 
-#include "host/image/file_io.h"
-#include "host/image/unique_fd.h"
+#include "host/files/file_io.h"
+#include "host/files/unique_fd.h"
 #include "host/text/escaped.h"
 
 namespace SecPolicyTool {

@@ -5,9 +5,9 @@
 #include <cerrno>
 #include <filesystem>
 
-#include "host/image/file_io.h"
-#include "host/image/system_failure.h"
-#include "host/image/unique_fd.h"
+#include "host/files/file_io.h"
+#include "host/files/system_failure.h"
+#include "host/files/unique_fd.h"
 #include "host/text/escaped.h"
 #include "secpolicy/host/host_error.h"
 

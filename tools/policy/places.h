@@ -1,7 +1,7 @@
 // Where in its files a loaded policy was decided.
 #pragma once
 
-#include "host/image/root_index.h"
+#include "host/root/root_index.h"
 #include "tools/policy/policy.h"
 #include "tools/policy/policy_files.h"
 

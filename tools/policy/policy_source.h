@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "host/image/host_directory.h"
+#include "host/state/host_directory.h"
 #include "tools/policy/policy.h"
 
 namespace SecPolicyTool {

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <stdexcept>
 
-#include "host/image/file_io.h"
+#include "host/files/file_io.h"
 #include "secpolicy/host/host_error.h"
 
 namespace SecPolicyTool {

@@ -3,7 +3,7 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 
-#include "host/image/root_index.h"
+#include "host/root/root_index.h"
 
 namespace SecPolicyTool {
 

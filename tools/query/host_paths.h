@@ -4,8 +4,8 @@
 #include <string>
 #include <vector>
 
-#include "host/image/host_directory.h"
 #include "host/root/file_tree.h"
+#include "host/state/host_directory.h"
 
 namespace SecPolicyTool {
 

@@ -5,8 +5,8 @@
 #include <string>
 #include <vector>
 
-#include "host/image/host_directory.h"
 #include "host/module/security_module.h"
+#include "host/state/host_directory.h"
 #include "tools/policy/policy.h"
 
 namespace SecPolicyTool {

@@ -4,7 +4,7 @@
 #include <utility>
 
 #include "host/engine/paths.h"
-#include "host/image/image_index.h"
+#include "host/root/image_index.h"
 #include "tools/query/rule_json.h"
 
 namespace SecPolicyTool {

@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "host/image/host_directory.h"
+#include "host/state/host_directory.h"
 #include "tools/query/decision.h"
 #include "tools/query/host_paths.h"
 #include "tools/query/question.h"

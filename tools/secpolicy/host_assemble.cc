@@ -2,8 +2,8 @@
 #include <iostream>
 #include <memory>
 
-#include "host/image/assemble.h"
-#include "host/image/host_directory.h"
+#include "host/root/assemble.h"
+#include "host/state/host_directory.h"
 #include "tools/policy/terminal.h"
 #include "tools/secpolicy/host_option.h"
 #include "tools/secpolicy/verbs.h"

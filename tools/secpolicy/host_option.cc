@@ -5,8 +5,8 @@
 #include <cstdlib>
 #include <filesystem>
 
-#include "host/image/assemble.h"
 #include "host/module/description_json.h"
+#include "host/root/assemble.h"
 #include "secpolicy/host/host_error.h"
 
 namespace SecPolicyTool {

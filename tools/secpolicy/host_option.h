@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include "host/image/host_directory.h"
+#include "host/state/host_directory.h"
 #include "tools/command_line/command_line.h"
 
 namespace SecPolicyTool {

@@ -8,8 +8,8 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
-#include "host/image/file_io.h"
-#include "host/image/system_failure.h"
+#include "host/files/file_io.h"
+#include "host/files/system_failure.h"
 #include "host/text/escaped.h"
 #include "tools/policy/output.h"
 #include "tools/query/test_report.h"

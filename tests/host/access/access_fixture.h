@@ -4,11 +4,11 @@
 #include <fcntl.h>
 
 #include "host/attached_host.h"
-#include "host/image/image_index.h"
+#include "host/root/image_index.h"
 #include "platform/tavon_exception.h"
 #include "platform/zek_access.h"
-#include "tests/host/image/temporary_directory.h"
 #include "tests/host/trace/trace_fixture.h"
+#include "tests/support/temporary_directory.h"
 
 namespace StandIn {
 

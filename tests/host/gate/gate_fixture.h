@@ -11,7 +11,7 @@
 
 #include "kernel/private_call.h"
 #include "platform/private_calls.h"
-#include "tests/host/image/child_process.h"
+#include "tests/support/child_process.h"
 #include "tests/support/host_test.h"
 
 namespace StandIn {

@@ -13,7 +13,7 @@
 #include <thread>
 
 #include "host/attached_host.h"
-#include "host/image/image_index.h"
+#include "host/root/image_index.h"
 #include "host/trace/observed_module.h"
 #include "secpolicy/host/host_error.h"
 #include "tests/host/gate/gate_fixture.h"

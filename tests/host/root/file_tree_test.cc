@@ -10,8 +10,8 @@
 #include <filesystem>
 
 #include "host/root/path_walk.h"
-#include "tests/host/image/archives.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/archives.h"
+#include "tests/support/temporary_directory.h"
 
 namespace StandIn {
 namespace {

@@ -1,7 +1,7 @@
 // Operations that are kept together.
-#include "tests/host/image/child_process.h"
 #include "tests/host/module/module_fixture.h"
-#include "tests/host/session/kept_module.h"
+#include "tests/host/state/kept_module.h"
+#include "tests/support/child_process.h"
 
 namespace StandIn {
 namespace {

@@ -8,7 +8,7 @@
 #include <csignal>
 #include <string>
 
-#include "host/image/session.h"
+#include "host/session/session.h"
 #include "kernel/private_call.h"
 #include "platform/private_calls.h"
 #include "tests/host/session/session_fixture.h"

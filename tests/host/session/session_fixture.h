@@ -7,10 +7,10 @@
 #include <functional>
 #include <string>
 
-#include "host/image/session.h"
 #include "host/module/description_json.h"
-#include "tests/host/image/child_process.h"
-#include "tests/host/image/host_fixture.h"
+#include "host/session/session.h"
+#include "tests/host/root/host_fixture.h"
+#include "tests/support/child_process.h"
 
 namespace StandIn {
 

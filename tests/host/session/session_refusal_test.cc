@@ -5,7 +5,7 @@
 #include <cerrno>
 #include <cstring>
 
-#include "host/image/change_root.h"
+#include "host/session/change_root.h"
 #include "tests/host/session/session_fixture.h"
 
 namespace StandIn {

@@ -1,5 +1,5 @@
 // What a process that has entered a host sees and does.
-#include "host/image/session.h"
+#include "host/session/session.h"
 
 #include <gmock/gmock.h>
 #include <sys/mount.h>

@@ -1,7 +1,7 @@
 // Which words a kernel takes, and what it costs to say which ones were meant.
 #include "tools/check/word_judge.h"
 
-#include "host/image/proc_processes.h"
+#include "host/kernel/proc_processes.h"
 #include "host/module/description_json.h"
 #include "host/module/simulated_module.h"
 #include "tests/tools/command_fixture.h"

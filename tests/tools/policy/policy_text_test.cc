@@ -4,10 +4,10 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "host/image/file_io.h"
+#include "host/files/file_io.h"
 #include "secpolicy/secpolicy.h"
-#include "tests/host/image/archives.h"
-#include "tests/host/image/temporary_directory.h"
+#include "tests/support/archives.h"
+#include "tests/support/temporary_directory.h"
 
 namespace SecPolicyTool {
 namespace {

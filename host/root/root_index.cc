@@ -1,0 +1,95 @@
+#include "host/root/root_index.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <utility>
+
+#include "host/module/module_error.h"
+#include "host/root/beneath.h"
+#include "host/root/image_file.h"
+#include "secpolicy/host/host_error.h"
+
+namespace StandIn {
+
+std::optional<RootIndex> RootIndex::Load(const HostDirectory& host,
+                                         const std::function<void()>& readRest) {
+  UniqueFd root;
+  std::string failure;
+  std::optional<ImageIndex> index = ReadImage(host, [&] {
+    readRest();
+    // Missing without an index too, and for a moment while the host is assembled.
+    try {
+      root = OpenDirectory(host.Ref(), kRootDirectory);
+      failure.clear();
+    } catch (const HostError& problem) {
+      failure = problem.what();
+    }
+  });
+  if (!index) {
+    return std::nullopt;
+  }
+  if (!failure.empty()) {
+    throw HostError(failure);
+  }
+  return RootIndex(std::move(*index), std::move(root));
+}
+
+std::optional<std::string> RootIndex::PathOf(dev_t device, ino_t inode) const {
+  const Files& files = AllFiles();
+  const auto found = files.byInode.find(inode);
+  if (device != files.device || found == files.byInode.end()) {
+    return std::nullopt;
+  }
+  return std::string(found->second.path);
+}
+
+std::string RootIndex::TardiskOf(ino_t inode) const {
+  const Files& files = AllFiles();
+  const auto found = files.byInode.find(inode);
+  return found != files.byInode.end() ? std::string(found->second.tardisk) : std::string();
+}
+
+const RootIndex::Files& RootIndex::AllFiles() const {
+  if (!files_) {
+    struct stat status {};
+    ::fstat(tree_.Root(), &status);
+    Files files{status.st_dev, {}};
+    for (const Found& file : AllPaths()) LookUp(file, files);
+    files_.emplace(std::move(files));
+  }
+  return *files_;
+}
+
+std::vector<RootIndex::Found> RootIndex::AllPaths() const {
+  ownPaths_ = {"/", kArchivesPath};
+  for (const TardiskContent& content : image_.tardisks) {
+    ownPaths_.push_back(std::string(kArchivesPath) + "/" + content.name);
+  }
+  std::vector<Found> paths;
+  for (const std::string& path : ownPaths_) paths.push_back({path, ""});
+  for (const TardiskContent& content : image_.tardisks) {
+    for (const std::string& path : content.paths) paths.push_back({path, content.name});
+  }
+  // Of a path that has both, the host's own comes first, and counts.
+  std::stable_sort(paths.begin(), paths.end(),
+                   [](const Found& a, const Found& b) { return a.path < b.path; });
+  return paths;
+}
+
+// Not by fstatat: it would follow symbolic links on the way, and see what has been mounted over a
+// path in place of the file that the image has there.
+void RootIndex::LookUp(const Found& file, Files& files) const {
+  const UniqueFd fd = OpenBeneath(tree_.Root(), std::string(file.path), O_PATH | O_NOFOLLOW);
+  if (!fd.IsOpen() && (errno == EMFILE || errno == ENFILE || errno == ENOMEM)) {
+    throw ModuleError(
+        errno, std::string("the files of the host cannot be looked up: ") + std::strerror(errno));
+  }
+  struct stat status;
+  if (fd.IsOpen() && ::fstat(fd.Get(), &status) == 0) files.byInode.emplace(status.st_ino, file);
+}
+
+}  // namespace StandIn
