@@ -23,7 +23,8 @@ bool IsLabelled(mode_t type) {
 
 mode_t TypeOfEntry(const FileTree& root, const std::string& path,
                    const SecPolicy::DirectoryEntry& entry) {
-  return entry.type == DT_UNKNOWN ? root.LinkType(path) : DTTOIF(entry.type);
+  if (entry.type == DT_UNKNOWN) return root.LinkType(path);
+  return static_cast<mode_t>(DTTOIF(entry.type));
 }
 
 // The directory's entries that are labelled, by name; true for directories.

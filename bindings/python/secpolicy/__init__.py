@@ -9,8 +9,8 @@
         with host.read_policy() as policy:
             print(policy.may("netDom", "read", "/etc/hosts").allowed)
 
-Everything is done by the library libsecpolicy_c, in child processes: the process that calls stays as
-it was. Calls release the interpreter's lock, and may be made from several threads at once.
+Everything is done by the library libsecpolicy_c in the calling process, which stays as it was. Calls
+release the interpreter's lock, and may be made from several threads at once.
 """
 
 from ._errors import (BadRequestError, HostError, InvalidArgumentError, LibraryError, LoadError,
