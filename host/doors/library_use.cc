@@ -1,5 +1,6 @@
 #include "host/doors/library_use.h"
 
+#include <algorithm>
 #include <array>
 #include <string_view>
 #include <utility>
@@ -35,11 +36,11 @@ LibraryUse* LibraryUse::Current() noexcept { return current; }
 bool LibraryUse::IsOnMachine(const std::string& path) const noexcept {
   if (policyDir_.empty() || !path.starts_with(policyDir_)) return false;
   const std::string_view below = std::string_view(path).substr(policyDir_.size());
-  for (const std::string_view directory : kPolicySubdirectories) {
-    if (below == directory) return true;
-    if (below.starts_with(directory) && below[directory.size()] == '/') return true;
-  }
-  return false;
+  return std::any_of(kPolicySubdirectories.begin(), kPolicySubdirectories.end(),
+                     [&](std::string_view directory) {
+                       return below == directory ||
+                              (below.starts_with(directory) && below[directory.size()] == '/');
+                     });
 }
 
 LoadEnd RunLoad(const std::string& dir) {

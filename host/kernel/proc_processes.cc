@@ -1,10 +1,10 @@
 #include "host/kernel/proc_processes.h"
 
 #include <fcntl.h>
-#include <signal.h>
 
 #include <array>
 #include <cerrno>
+#include <csignal>
 #include <sstream>
 #include <string>
 
