@@ -158,8 +158,4 @@ void PrintLine(std::ostream& out, const std::string& line) {
   }
 }
 
-void StopEscaping(std::ostream& out) {
-  if (auto* terminal = TerminalOutput::EscapingBuffer::Of(out)) terminal->Leave();
-}
-
 }  // namespace SecPolicyTool

@@ -83,7 +83,6 @@ class TerminalOutput {
   class EscapingBuffer;
   friend class TerminalText;
   friend void PrintLine(std::ostream& out, const std::string& line);
-  friend void StopEscaping(std::ostream& out);
 
   std::unique_ptr<EscapingBuffer> out_;
   std::unique_ptr<EscapingBuffer> err_;
@@ -92,8 +91,5 @@ class TerminalOutput {
 // Prints `line` and ends it, in one piece: on a terminal with line ends that it holds escaped too,
 // so that a name cannot pass for a line of its own.
 void PrintLine(std::ostream& out, const std::string& line);
-
-// For a process whose stream has become something else than the terminal that it was.
-void StopEscaping(std::ostream& out);
 
 }  // namespace SecPolicyTool

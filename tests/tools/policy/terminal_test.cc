@@ -124,13 +124,6 @@ TEST_F(OutputTest, LineOnATerminalIsOneLine) {
   EXPECT_EQ(Sent(), "Error: a\\x0aError: b\n");
 }
 
-TEST_F(OutputTest, EscapingEndsWithTheTerminal) {
-  TerminalOutput output(true, false);
-  StopEscaping(std::cout);
-  std::cout << "\x1b";
-  EXPECT_EQ(Sent(), "\x1b");
-}
-
 TEST_F(OutputTest, StreamIsGivenBack) {
   { const TerminalOutput output(true, true); }
   std::cout << "\x1b";
