@@ -9,15 +9,13 @@
 #include <string_view>
 
 #include "core/file_access.h"
+#include "core/policy_lines.h"
 
 namespace SecPolicy {
 
 // An open file that is read line by line; closed with this object.
 class LineReader {
  public:
-  // A longer line ends the file: callers rely on that bound.
-  static constexpr std::size_t kLongestLine = 1023;
-
   // Opens the policy file `path`; where that fails, IsOpen() is false.
   explicit LineReader(const std::string& path) : file_(OpenPolicyFile(path)) {}
 
@@ -32,10 +30,9 @@ class LineReader {
   std::optional<std::string_view> Next();
 
  private:
-  // Brings the rest of a line to the front and reads behind it; false at the end.
-  bool Refill();
+  // Brings the rest of a line to the front and reads behind it, or notes that the end was reached.
+  void Refill();
   std::size_t ReadBehind(std::size_t kept);
-  std::string_view Take(std::size_t size, std::size_t skipped);
 
   std::filebuf file_;
   std::array<char, 8192> block_;

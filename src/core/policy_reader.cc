@@ -1,11 +1,11 @@
 // The reader of policy files: lines to words, files to lines, directories to files.
-#include <algorithm>
 #include <string_view>
 #include <utility>
 
 #include "core/directory_stream.h"
 #include "core/file_access.h"
 #include "core/line_reader.h"
+#include "core/policy_lines.h"
 #include "secpolicy/secpolicy.h"
 
 namespace SecPolicy {
@@ -16,18 +16,12 @@ namespace {
 
 using Lines = std::map<unsigned int, std::queue<std::string>>;
 
-std::string_view BeforeComment(std::string_view line) { return line.substr(0, line.find('#')); }
-
 bool HasWords(std::string_view text) {
   return text.find_first_not_of(' ') != std::string_view::npos;
 }
 
 void AppendWords(std::string_view text, std::queue<std::string>& words) {
-  while (!text.empty()) {
-    const std::string_view word = text.substr(0, text.find(' '));
-    if (!word.empty()) words.emplace(word);
-    text.remove_prefix(std::min(word.size() + 1, text.size()));
-  }
+  ForEachWord(text, [&](std::string_view word, std::size_t) { words.emplace(word); });
 }
 
 std::queue<std::string> SplitAtSpaces(std::string_view text) {

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <stdexcept>
+#include <utility>
 
 #include "host/files/file_io.h"
 #include "secpolicy/host/host_error.h"
@@ -10,40 +11,37 @@ namespace SecPolicyTool {
 
 namespace {
 
-PolicyLine LineOf(std::string_view whole, unsigned int number) {
-  const std::string_view taken = whole.substr(0, kLongestLine);
-  return {number, std::string(whole), WordsOf(taken.substr(0, taken.find('\0')))};
+// The lines of `text`, of which the last may lack its end.
+std::size_t CountLines(std::string_view text) {
+  const auto ends = static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n'));
+  return ends + (text.empty() || text.ends_with('\n') ? 0 : 1);
 }
 
 }  // namespace
 
 std::vector<LineWord> WordsOf(std::string_view line) {
-  line = line.substr(0, line.find('#'));
   std::vector<LineWord> words;
-  for (std::size_t start = 0; start < line.size();) {
-    const std::size_t end = std::min(line.find(' ', start), line.size());
-    if (end != start) {
-      words.push_back(
-          {std::string(line.substr(start, end - start)), static_cast<unsigned int>(start + 1)});
-    }
-    start = end + 1;
-  }
+  SecPolicy::ForEachWord(
+      SecPolicy::BeforeComment(line), [&](std::string_view word, std::size_t position) {
+        words.push_back({std::string(word), static_cast<unsigned int>(position + 1)});
+      });
   return words;
 }
 
 PolicyText ReadPolicyText(std::string_view content) {
   PolicyText text;
-  bool isHidden = false;
-  for (std::size_t start = 0; start < content.size();) {
-    const std::size_t end = std::min(content.find('\n', start), content.size());
-    const std::string_view whole = content.substr(start, end - start);
-    start = end + 1;
-    if (isHidden) {
-      ++text.hiddenLines;
-      continue;
+  std::string_view unread = content;
+  while (const auto line = SecPolicy::TakeLine(unread, true)) {
+    const auto number = static_cast<unsigned int>(text.lines.size() + 1);
+    std::string whole(line->bytes);
+    if (line->endsFile) {
+      const std::size_t cut = std::min(unread.find('\n'), unread.size());
+      whole += unread.substr(0, cut);
+      unread.remove_prefix(std::min(cut + 1, unread.size()));
+      text.hiddenLines = CountLines(unread);
+      unread = {};
     }
-    text.lines.push_back(LineOf(whole, static_cast<unsigned int>(text.lines.size() + 1)));
-    isHidden = whole.size() > kLongestLine;
+    text.lines.push_back({number, std::move(whole), WordsOf(line->text)});
   }
   return text;
 }

@@ -6,6 +6,7 @@
 #include <string_view>
 #include <vector>
 
+#include "core/policy_lines.h"
 #include "host/root/file_tree.h"
 #include "tools/policy/policy.h"
 
@@ -24,7 +25,7 @@ struct PolicyLine {
 };
 
 // What the library's reader takes of a line; a longer one is the last that is read of its file.
-inline constexpr std::size_t kLongestLine = 1023;
+using SecPolicy::kLongestLine;
 
 struct PolicyText {
   std::vector<PolicyLine> lines;  // all that are read, blank ones too
