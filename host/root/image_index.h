@@ -10,6 +10,8 @@ namespace StandIn {
 
 // Where the root file system has the archives themselves.
 inline constexpr char kArchivesPath[] = "/tardisks";
+// Where it has the policies that tardisks bring.
+inline constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
 
 // An archive and the paths in the root file system that are its own, in byte order. They begin with
 // "/" and are as EntryPath makes them.

@@ -48,20 +48,48 @@ std::optional<std::string> RootIndex::PathOf(dev_t device, ino_t inode) const {
 }
 
 std::string RootIndex::TardiskOf(ino_t inode) const {
+  if (!files_) {
+    const Files& policies = PolicyFiles();
+    const auto policy = policies.byInode.find(inode);
+    if (policy != policies.byInode.end()) return std::string(policy->second.tardisk);
+  }
   const Files& files = AllFiles();
   const auto found = files.byInode.find(inode);
   return found != files.byInode.end() ? std::string(found->second.tardisk) : std::string();
 }
 
+RootIndex::Files RootIndex::NoFiles() const {
+  struct stat status {};
+  ::fstat(tree_.Root(), &status);
+  return {status.st_dev, {}};
+}
+
 const RootIndex::Files& RootIndex::AllFiles() const {
   if (!files_) {
-    struct stat status {};
-    ::fstat(tree_.Root(), &status);
-    Files files{status.st_dev, {}};
-    for (const Found& file : AllPaths()) LookUp(file, files);
+    Files files = NoFiles();
+    for (const Found& file : AllPaths()) {
+      if (const auto status = StatusOf(file)) files.byInode.emplace(status->st_ino, file);
+    }
     files_.emplace(std::move(files));
   }
   return *files_;
+}
+
+const RootIndex::Files& RootIndex::PolicyFiles() const {
+  if (!policyFiles_) {
+    const std::string above = std::string(kTardiskPolicyDir) + "/";
+    Files files = NoFiles();
+    for (const TardiskContent& content : image_.tardisks) {
+      for (const std::string& path : content.paths) {
+        if (!path.starts_with(above)) continue;
+        const Found file{path, content.name};
+        const auto status = StatusOf(file);
+        if (status && status->st_nlink == 1) files.byInode.emplace(status->st_ino, file);
+      }
+    }
+    policyFiles_.emplace(std::move(files));
+  }
+  return *policyFiles_;
 }
 
 std::vector<RootIndex::Found> RootIndex::AllPaths() const {
@@ -82,14 +110,15 @@ std::vector<RootIndex::Found> RootIndex::AllPaths() const {
 
 // Not by fstatat: it would follow symbolic links on the way, and see what has been mounted over a
 // path in place of the file that the image has there.
-void RootIndex::LookUp(const Found& file, Files& files) const {
+std::optional<struct stat> RootIndex::StatusOf(const Found& file) const {
   const UniqueFd fd = OpenBeneath(tree_.Root(), std::string(file.path), O_PATH | O_NOFOLLOW);
   if (!fd.IsOpen() && (errno == EMFILE || errno == ENFILE || errno == ENOMEM)) {
     throw ModuleError(
         errno, std::string("the files of the host cannot be looked up: ") + std::strerror(errno));
   }
-  struct stat status;
-  if (fd.IsOpen() && ::fstat(fd.Get(), &status) == 0) files.byInode.emplace(status.st_ino, file);
+  struct stat status {};
+  if (!fd.IsOpen() || ::fstat(fd.Get(), &status) != 0) return std::nullopt;
+  return status;
 }
 
 }  // namespace StandIn

@@ -1,6 +1,7 @@
 // Finding the files of the assembled root file system by their inodes.
 #pragma once
 
+#include <sys/stat.h>
 #include <sys/types.h>
 
 #include <deque>
@@ -20,9 +21,9 @@
 namespace StandIn {
 
 // Answers which path of the image a file is, and which archive brought it. The numbers of all files
-// are looked up when the first question is asked; what is put into root/ by others, mounted there,
-// or has been removed since is no part of the image. For one thread at a time. A question throws
-// ModuleError when there are no descriptors or no memory to look the files up with.
+// are looked up when the first question is asked that needs them; what is put into root/ by others,
+// mounted there, or has been removed since is no part of the image. For one thread at a time. A
+// question throws ModuleError when there are no descriptors or no memory to look the files up with.
 class RootIndex {
  public:
   // `root` is a descriptor of root/ (O_PATH will do).
@@ -58,14 +59,20 @@ class RootIndex {
   };
 
   [[nodiscard]] const Files& AllFiles() const;
+  // The policies of tardisks among them, which are what is asked about most: those of them whose
+  // numbers no other path can have.
+  [[nodiscard]] const Files& PolicyFiles() const;
+  [[nodiscard]] Files NoFiles() const;
   // The paths that belong to no archive, and those of the archives, in byte order.
   [[nodiscard]] std::vector<Found> AllPaths() const;
-  void LookUp(const Found& file, Files& files) const;
+  // The status of a file of the image; nothing when it is not there.
+  [[nodiscard]] std::optional<struct stat> StatusOf(const Found& file) const;
 
   ImageIndex image_;
   FileTree tree_;
   mutable std::deque<std::string> ownPaths_;  // those that are not in image_
   mutable std::optional<Files> files_;        // from the first question on
+  mutable std::optional<Files> policyFiles_;  // from the first question about a tardisk on
 };
 
 }  // namespace StandIn

@@ -56,6 +56,23 @@ TEST_F(RootIndexTest, OfHardLinksTheFirstPathCounts) {
   EXPECT_EQ(OwnerOf("/etc/motd"), "base.tar");
 }
 
+// What a load asks about is the policy of a tardisk; a host may have any number of other files.
+TEST_F(RootIndexTest, PoliciesOfTardisksAreFoundWithoutTheOtherFiles) {
+  const std::string policies = std::string(kTardiskPolicyDir).substr(1) + "/";
+  Tardisk("base.tar", Archive()
+                          .File(policies + "base", "")
+                          .File(policies + "linked", "")
+                          .HardLink("first", policies + "linked"));
+  Assembled();
+  const RootIndex index = Index();
+  EXPECT_EQ(index.TardiskOf(Status("/" + policies + "base").st_ino), "base.tar");
+  WriteBytes(Path("root/etc/new"), "");
+  std::filesystem::rename(Path("root/etc/new"), Path("root/etc/extra"));
+  EXPECT_EQ(PathOf(index, Status("/etc/extra")), "/etc/extra");
+  EXPECT_EQ(Index().TardiskOf(Status("/" + policies + "linked").st_ino), "base.tar");
+  EXPECT_EQ(Index().TardiskOf(Status("/etc/extra").st_ino), "extra.tar");
+}
+
 TEST_F(RootIndexTest, WhatCameOtherwiseIsUnknown) {
   WriteBytes(Path("root/etc/new"), "");
   EXPECT_EQ(PathOf("/etc/new"), std::nullopt);
