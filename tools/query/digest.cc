@@ -2,72 +2,140 @@
 
 #include <openssl/evp.h>
 
+#include <algorithm>
 #include <array>
-#include <set>
+#include <functional>
+#include <initializer_list>
+#include <map>
+#include <memory>
 #include <stdexcept>
+#include <string_view>
+#include <vector>
 
 namespace SecPolicyTool {
 
 namespace {
 
-using Fields = std::vector<std::string>;
-using Records = std::set<std::string>;
+using Records = std::vector<std::string>;
 
-std::string RecordOf(const Fields& fields) {
+void AddField(std::string_view field, std::string& record) {
+  record += std::to_string(field.size());
+  record += ':';
+  record += field;
+  record += ',';
+}
+
+std::string FieldsOf(std::initializer_list<std::string_view> fields) {
   std::string record;
-  for (const std::string& field : fields) {
-    record += std::to_string(field.size()) + ":" + field + ",";
-  }
+  for (const std::string_view field : fields) AddField(field, record);
+  return record;
+}
+
+// The records of some rules or names; each begins with the fields that its group is kept by.
+using Group = std::function<Records()>;
+// Since no group's fields begin with those of another, their order is that of all records: so there
+// is one group at a time in memory.
+using Groups = std::map<std::string, Group>;
+
+std::string RecordOf(const std::string& fields, const PolicyRule& rule) {
+  std::string record = fields;
+  AddField(InfoOf(rule.key.type).keyword, record);
+  for (const std::string& word : rule.key.words) AddField(word, record);
+  AddField(DecisionOf(rule), record);
+  if (rule.key.world != 0) AddField(std::to_string(rule.key.world), record);
   return record + "\n";
 }
 
-Fields FieldsOf(const std::string& domain, const PolicyRule& rule) {
-  Fields fields{"rule", domain, InfoOf(rule.key.type).keyword};
-  fields.insert(fields.end(), rule.key.words.begin(), rule.key.words.end());
-  fields.push_back(DecisionOf(rule));
-  if (rule.key.world != 0) fields.push_back(std::to_string(rule.key.world));
-  return fields;
+Group RulesOf(const std::string& fields, const DomainContent& domain) {
+  return [fields, &domain] {
+    Records records;
+    records.reserve(domain.rules.size());
+    for (const PolicyRule& rule : domain.rules) records.push_back(RecordOf(fields, rule));
+    return records;
+  };
 }
 
-Records RecordsOf(const Policy& policy) {
-  Records records;
+// A record for each entry of `map`, unless `content` gives nothing for it.
+template <typename Map, typename Content>
+void AddNames(const char* kind, const Map& map, const Content& content, Groups& groups) {
+  groups[FieldsOf({kind})] = [kind, &map, content] {
+    Records records;
+    for (const auto& [name, value] : map) {
+      if (const std::optional<std::string> rest = content(value)) {
+        records.push_back(FieldsOf({kind, name}) + *rest + "\n");
+      }
+    }
+    return records;
+  };
+}
+
+Groups GroupsOf(const Policy& policy) {
+  Groups groups;
+  const auto nothing = [](const DomainContent&) { return std::optional<std::string>(""); };
+  const auto label = [](const LabelledFile& file) {
+    return std::optional<std::string>(FieldsOf({file.label}));
+  };
+  const auto unlessPredefined = [](const ObjectContent& object) {
+    return object.isPredefined ? std::nullopt : std::optional<std::string>("");
+  };
   for (const auto& [name, domain] : policy.domains) {
-    records.insert(RecordOf({"domain", name}));
-    for (const PolicyRule& rule : domain.rules) records.insert(RecordOf(FieldsOf(name, rule)));
+    const std::string fields = FieldsOf({"rule", name});
+    groups[fields] = RulesOf(fields, domain);
   }
-  for (const auto& [name, object] : policy.objects) {
-    if (!object.isPredefined) records.insert(RecordOf({"object", name}));
-  }
-  for (const auto& [path, file] : policy.files) {
-    records.insert(RecordOf({"file", path, file.label}));
-  }
-  for (const auto& [name, tardisk] : policy.tardisks) {
-    records.insert(RecordOf({"tardisk", name, tardisk.label}));
-  }
-  return records;
+  AddNames("domain", policy.domains, nothing, groups);
+  AddNames("object", policy.objects, unlessPredefined, groups);
+  AddNames("file", policy.files, label, groups);
+  AddNames("tardisk", policy.tardisks, label, groups);
+  return groups;
 }
 
-std::string Sha256(const std::string& text) {
-  std::array<unsigned char, EVP_MAX_MD_SIZE> digest{};
-  unsigned int size = 0;
-  if (EVP_Digest(text.data(), text.size(), digest.data(), &size, EVP_sha256(), nullptr) != 1) {
+// The SHA-256 of texts, one after the other.
+class Sha256 {
+ public:
+  Sha256() : context_(EVP_MD_CTX_new()) {
+    Require(context_ != nullptr && EVP_DigestInit_ex(context_.get(), EVP_sha256(), nullptr) == 1);
+  }
+  void Add(const std::string& text) {
+    Require(EVP_DigestUpdate(context_.get(), text.data(), text.size()) == 1);
+  }
+  std::string Hex() {
+    std::array<unsigned char, EVP_MAX_MD_SIZE> digest{};
+    unsigned int size = 0;
+    Require(EVP_DigestFinal_ex(context_.get(), digest.data(), &size) == 1);
+    constexpr char kHex[] = "0123456789abcdef";
+    std::string hex;
+    for (unsigned int i = 0; i < size; ++i) {
+      hex += kHex[digest[i] >> 4];
+      hex += kHex[digest[i] & 0xF];
+    }
+    return hex;
+  }
+
+ private:
+  struct Free {
+    void operator()(EVP_MD_CTX* context) const { EVP_MD_CTX_free(context); }
+  };
+
+  static void Require(bool isDone) {
+    if (isDone) return;
     throw std::runtime_error("the digest cannot be computed: SHA-256 is not available");
   }
-  constexpr char kHex[] = "0123456789abcdef";
-  std::string hex;
-  for (unsigned int i = 0; i < size; ++i) {
-    hex += kHex[digest[i] >> 4];
-    hex += kHex[digest[i] & 0xF];
-  }
-  return hex;
-}
+
+  std::unique_ptr<EVP_MD_CTX, Free> context_;
+};
 
 }  // namespace
 
 std::string Digest(const Policy& policy) {
-  std::string text = RecordOf({"secpolicy-digest", "1"});
-  for (const std::string& record : RecordsOf(policy)) text += record;
-  return Sha256(text);
+  Sha256 sum;
+  sum.Add(FieldsOf({"secpolicy-digest", "1"}) + "\n");
+  for (const auto& [fields, group] : GroupsOf(policy)) {
+    Records records = group();
+    std::sort(records.begin(), records.end());
+    records.erase(std::unique(records.begin(), records.end()), records.end());
+    for (const std::string& record : records) sum.Add(record);
+  }
+  return sum.Hex();
 }
 
 }  // namespace SecPolicyTool
