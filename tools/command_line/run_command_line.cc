@@ -1,6 +1,8 @@
 // The one place that knows the library which parses command lines.
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <set>
+#include <string_view>
 
 #include "host/text/escaped.h"
 #include "tools/command_line/command_line.h"
@@ -67,8 +69,10 @@ void AddRelations(CLI::App& app, const CommandOption& option) {
   if (!option.needs.empty()) added->needs(app.get_option(option.needs));
 }
 
-// The app refers to `line`, and `chosen` becomes the one whose words are there.
-void Describe(CLI::App& app, const CommandLine& line, const CommandLine*& chosen) {
+// The app refers to `line`, and `chosen` becomes the one whose words are there. Verbs that none of
+// `words` names only have their names: to describe all of them takes longer than to parse.
+void Describe(CLI::App& app, const CommandLine& line, const std::set<std::string_view>& words,
+              const CommandLine*& chosen) {
   if (!line.footer.empty()) app.footer(line.footer);
   if (!line.version.empty()) app.set_version_flag("--version", line.version);
   for (const CommandOption& option : line.options) {
@@ -82,7 +86,8 @@ void Describe(CLI::App& app, const CommandLine& line, const CommandLine*& chosen
   for (const CommandOption& operand : line.operands) AddValue(app, operand);
   if (!line.verbs.empty()) app.require_subcommand(1);
   for (const CommandLine& verb : line.verbs) {
-    Describe(*app.add_subcommand(verb.name, verb.description), verb, chosen);
+    CLI::App* added = app.add_subcommand(verb.name, verb.description);
+    if (words.contains(verb.name)) Describe(*added, verb, words, chosen);
   }
   if (line.run) app.callback([&line, &chosen] { chosen = &line; });
 }
@@ -92,7 +97,7 @@ void Describe(CLI::App& app, const CommandLine& line, const CommandLine*& chosen
 ExitStatus RunCommandLine(const CommandLine& line, int argc, const char* const* argv) {
   CLI::App app(line.description, line.name);
   const CommandLine* chosen = nullptr;
-  Describe(app, line, chosen);
+  Describe(app, line, {argv, argv + argc}, chosen);
   try {
     app.parse(argc, argv);
     return chosen->run();
