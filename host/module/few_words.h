@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <array>
+#include <compare>
 #include <initializer_list>
 #include <stdexcept>
 #include <string>
@@ -37,8 +38,17 @@ class FewWords {
   [[nodiscard]] std::string& operator[](std::size_t index) { return words_[index]; }
   [[nodiscard]] const std::string& operator[](std::size_t index) const { return words_[index]; }
 
+  // std::out_of_range unless `index` is below size().
+  [[nodiscard]] const std::string& at(std::size_t index) const {
+    if (index >= size_) throw std::out_of_range("a rule has no such word");
+    return words_[index];
+  }
+
   friend bool operator==(const FewWords& a, const FewWords& b) {
     return std::equal(a.begin(), a.end(), b.begin(), b.end());
+  }
+  friend std::strong_ordering operator<=>(const FewWords& a, const FewWords& b) {
+    return std::lexicographical_compare_three_way(a.begin(), a.end(), b.begin(), b.end());
   }
 
  private:

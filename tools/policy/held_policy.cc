@@ -10,11 +10,11 @@ using namespace StandIn;
 
 namespace {
 
-PolicyRule ToPolicyRule(RuleType type, const Rule& rule) {
+PolicyRule ToPolicyRule(RuleType type, Rule&& rule) {
   PolicyRule held;
-  held.key = {type, {rule.words.begin(), rule.words.end()}, 0};
+  held.key = {type, std::move(rule.words), 0};
   held.isGranted = rule.decision == Decision::kGrant;
-  if (rule.line != 0) held.place = Place{"", rule.line, 0};
+  if (rule.line != 0) held.place = Place{{}, rule.line, 0};
   return held;
 }
 
@@ -29,9 +29,9 @@ std::vector<PolicyRule> RulesOf(SecurityModule& module, DomainId domain) {
   std::vector<PolicyRule> rules;
   for (const RuleTypeInfo& info : kRuleTypes) {
     if (info.HasDecision()) {
-      for (const Rule& rule : module.Rules(info.type, domain)) {
-        rules.push_back(ToPolicyRule(info.type, rule));
-      }
+      std::vector<Rule> set = module.Rules(info.type, domain);
+      rules.reserve(rules.size() + set.size());
+      for (Rule& rule : set) rules.push_back(ToPolicyRule(info.type, std::move(rule)));
     } else {
       for (const FileRule& rule : module.FileRules(domain)) rules.push_back(ToPolicyRule(rule));
     }

@@ -38,7 +38,7 @@ std::string ResolvedPath(const StandIn::FileTree& root, const std::string& path)
 
 // ---- Rules ----
 
-void PlaceKeywordRules(const std::string& file, const Lines& lines, DomainContent& domain) {
+void PlaceKeywordRules(const SharedName& file, const Lines& lines, DomainContent& domain) {
   for (PolicyRule& rule : domain.rules) {
     if (!rule.place) continue;
     const std::size_t index = rule.place->line - 1;
@@ -48,7 +48,7 @@ void PlaceKeywordRules(const std::string& file, const Lines& lines, DomainConten
   }
 }
 
-void PlacePathRules(const std::string& file, const Lines& lines, const StandIn::FileTree& root,
+void PlacePathRules(const SharedName& file, const Lines& lines, const StandIn::FileTree& root,
                     DomainContent& domain) {
   std::map<std::string, PolicyRule*> rules;
   for (PolicyRule& rule : domain.rules) {

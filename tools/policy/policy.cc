@@ -20,7 +20,7 @@ std::string LineOf(const PolicyRule& rule) {
 
 std::string PlaceText(const std::optional<Place>& place) {
   if (!place) return "-";
-  std::string text = place->file;
+  std::string text = place->file.Text();
   for (const unsigned int number : {place->line, place->column}) {
     if (number == 0) break;
     text += (text.empty() ? "line " : ":") + std::to_string(number);

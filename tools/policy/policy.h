@@ -11,12 +11,13 @@
 #include "host/module/rule.h"
 #include "host/module/security_module.h"
 #include "platform/rule_types.h"
+#include "tools/policy/shared_name.h"
 
 namespace SecPolicyTool {
 
 // Where something stands. `line` and `column` count from 1; 0 when unknown.
 struct Place {
-  std::string file;
+  SharedName file;
   unsigned int line = 0;
   unsigned int column = 0;
 
@@ -32,7 +33,7 @@ using ZekCtl::Security::TypeOfKeyword;
 // What a domain's rule decides on: its key. The words are those of its RuleTypeInfo.
 struct RuleKey {
   RuleType type = RuleType::kSyscall;
-  std::vector<std::string> words;
+  StandIn::FewWords words;
   StandIn::WorldId world = 0;  // of path rules: the one world that it is for; 0 for the domain
 
   // The check takes the compiler's own comparison with 0 for a pointer's.

@@ -4,6 +4,7 @@
 #include <string>
 #include <vector>
 
+#include "host/image/image_index.h"
 #include "host/root/file_tree.h"
 
 namespace SecPolicyTool {
@@ -11,7 +12,7 @@ namespace SecPolicyTool {
 // A host's own policy directory, in the host.
 inline constexpr char kSystemPolicyDir[] = "/etc/olvane/secpolicy";
 // Where every load reads the policy of the tardisks, whatever directory it is given.
-inline constexpr char kTardiskPolicyDir[] = "/etc/olvane/secpolicy/tardisks";
+using StandIn::kTardiskPolicyDir;
 
 // A policy directory: the tree that it lies in, its path there, and what its user calls it. The
 // tree has to live as long as this object.

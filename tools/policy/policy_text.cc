@@ -64,7 +64,7 @@ std::vector<PolicyLine> PolicyLines(const StandIn::FileTree& tree, const std::st
   return {};
 }
 
-Place PlaceOf(const std::string& file, const PolicyLine& line) {
+Place PlaceOf(const SharedName& file, const PolicyLine& line) {
   return {file, line.number, line.words.empty() ? 0 : line.words.front().column};
 }
 

@@ -46,6 +46,6 @@ PolicyText ReadPolicyFile(const StandIn::FileTree& tree, const std::string& path
 std::vector<PolicyLine> PolicyLines(const StandIn::FileTree& tree, const std::string& path);
 
 // Where a line of `file` begins: at its first word.
-Place PlaceOf(const std::string& file, const PolicyLine& line);
+Place PlaceOf(const SharedName& file, const PolicyLine& line);
 
 }  // namespace SecPolicyTool

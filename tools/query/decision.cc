@@ -9,7 +9,8 @@ DomainDecisions::DomainDecisions(const DomainContent& domain) : content_(domain)
   for (std::size_t number = 0; number < domain.rules.size(); ++number) {
     const PolicyRule& rule = domain.rules[number];
     if (rule.key.world != 0) continue;
-    rules_.Add(rule.key.type, rule.key.words, {rule.isGranted, rule.permission, number});
+    rules_.Add(rule.key.type, {rule.key.words.begin(), rule.key.words.end()},
+               {rule.isGranted, rule.permission, number});
   }
 }
 
@@ -29,7 +30,8 @@ Answer DomainDecisions::DecideOnFile(const AskedFile& file) const {
 
 Answer DomainDecisions::Decide(const Question& question) const {
   if (question.file) return DecideOnFile(*question.file);
-  const StandIn::NumberedRule* const rule = rules_.Find(question.key.type, question.key.words);
+  const StandIn::NumberedRule* const rule =
+      rules_.Find(question.key.type, {question.key.words.begin(), question.key.words.end()});
   if (rule == nullptr) return {};
   return {rule->isGranted, RuleOf(rule->number)};
 }

@@ -19,7 +19,7 @@ void AddPlaceJson(const std::optional<Place>& place, json& entry) {
 json RuleJson(const PolicyRule& rule) {
   const RuleTypeInfo& info = InfoOf(rule.key.type);
   json entry{{"type", info.keyword},
-             {"words", rule.key.words},
+             {"words", std::vector<std::string>(rule.key.words.begin(), rule.key.words.end())},
              {info.HasDecision() ? "decision" : "permission", DecisionOf(rule)},
              {"line", LineOf(rule)}};
   if (rule.key.world != 0) entry["world"] = rule.key.world;

@@ -20,7 +20,8 @@ Deciding DecidingOn(const std::string& path, const DomainContent& domain) {
   for (std::size_t number = 0; number < domain.rules.size(); ++number) {
     const PolicyRule& rule = domain.rules[number];
     if (rule.key.type != RuleType::kPath) continue;
-    rulesOf[rule.key.world].Add(rule.key.type, rule.key.words, {false, rule.permission, number});
+    rulesOf[rule.key.world].Add(rule.key.type, {rule.key.words.begin(), rule.key.words.end()},
+                                {false, rule.permission, number});
   }
   Deciding deciding;
   for (const auto& [world, rules] : rulesOf) {

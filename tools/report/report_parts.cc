@@ -61,7 +61,7 @@ Html PlaceHtml(const std::optional<Place>& place, const std::string& file) {
   if (!place) return {};
   Place shown = *place;
   if (shown.line != 0 && shown.file == file) {
-    shown.file.clear();
+    shown.file = {};
     shown.column = 0;
   }
   return Element("small", PlaceText(shown));

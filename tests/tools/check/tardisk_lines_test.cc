@@ -71,7 +71,7 @@ TEST_F(TardiskLinesTest, TwoFilesOfOneTardisk) {
   ASSERT_EQ(findings.size(), 1U);
   EXPECT_EQ(findings[0].id, "duplicate-tardisk-policy");
   EXPECT_THAT(LoadErrorsOf(),
-              ElementsAre(findings[0].loadMessage, "Ignoring " + findings[0].place.file));
+              ElementsAre(findings[0].loadMessage, "Ignoring " + findings[0].place.file.Text()));
 }
 
 TEST_F(TardiskLinesTest, FileOfNoTardiskAndDirectory) {
