@@ -194,15 +194,16 @@ constexpr std::optional<RuleType> TypeOfKeyword(std::string_view keyword) {
   return std::nullopt;
 }
 
-// Whether rows stand at the places of their enumerators, in the byte order of their keywords.
-constexpr bool AreRuleTypesInOrder() {
-  for (std::size_t i = 0; i < kRuleTypes.size(); ++i) {
-    if (kRuleTypes[i].type != static_cast<RuleType>(i)) return false;
-    if (i != 0 && std::string_view(kRuleTypes[i].keyword) <= kRuleTypes[i - 1].keyword)
-      return false;
+// Whether the entries stand at the places of their enumerators, in the byte order of their
+// keywords.
+constexpr bool AreInOrder(std::span<const RuleTypeInfo> types) {
+  bool isInOrder = true;
+  for (std::size_t i = 0; i < types.size(); ++i) {
+    isInOrder &= types[i].type == static_cast<RuleType>(i);
+    isInOrder &= i == 0 || std::string_view(types[i - 1].keyword) < types[i].keyword;
   }
-  return true;
+  return isInOrder;
 }
-static_assert(AreRuleTypesInOrder());
+static_assert(AreInOrder(kRuleTypes));
 
 }  // namespace ZekCtl::Security

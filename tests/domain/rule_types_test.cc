@@ -82,4 +82,15 @@ TEST(RuleTypesTest, QuestionsUseEachPositionOnce) {
   }
 }
 
+// As a program evaluates it, too, and not the compiler alone.
+TEST(RuleTypesTest, OrderIsThatOfTheEnumeratorsAndOfTheKeywords) {
+  auto types = ZekCtl::Security::RuleInfos();
+  EXPECT_TRUE(ZekCtl::Security::AreInOrder(types));
+  std::swap(types.front().keyword, types.back().keyword);
+  EXPECT_FALSE(ZekCtl::Security::AreInOrder(types));
+  types = ZekCtl::Security::RuleInfos();
+  std::swap(types.front().type, types.back().type);
+  EXPECT_FALSE(ZekCtl::Security::AreInOrder(types));
+}
+
 }  // namespace

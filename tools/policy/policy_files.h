@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "host/image/image_index.h"
+#include "host/root/image_index.h"
 #include "host/root/file_tree.h"
 
 namespace SecPolicyTool {

@@ -3,14 +3,20 @@
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <linux/filter.h>
+#include <linux/seccomp.h>
+#include <sys/prctl.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <filesystem>
 
+#include "host/root/beneath.h"
 #include "host/root/path_walk.h"
 #include "tests/support/archives.h"
+#include "tests/support/child_process.h"
 #include "tests/support/temporary_directory.h"
 
 namespace StandIn {
@@ -139,6 +145,69 @@ TEST_F(FileTreeTest, LongChainsAndPathsAreRefused) {
   EXPECT_EQ(errno, ELOOP);
   EXPECT_FALSE(PathWalk(root.Get()).Go(std::string(5000, 'x'), LastLink::kFollowed));
   EXPECT_EQ(errno, ENAMETOOLONG);
+}
+
+// As on an older kernel, or under an emulator that does not know the call.
+void RemoveOpenat2() {
+  sock_filter filter[] = {
+      BPF_STMT(BPF_LD | BPF_W | BPF_ABS, offsetof(seccomp_data, nr)),
+      BPF_JUMP(BPF_JMP | BPF_JEQ | BPF_K, SYS_openat2, 0, 1),
+      BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ERRNO | ENOSYS),
+      BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ALLOW),
+  };
+  const sock_fprog program{std::size(filter), filter};
+  ASSERT_EQ(prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0), 0);
+  ASSERT_EQ(prctl(PR_SET_SECCOMP, SECCOMP_MODE_FILTER, &program), 0);
+}
+
+TEST_F(FileTreeTest, PathsAreTheSameWithoutTheCall) {
+  EXPECT_TRUE(ChildPassed(StartChild([&] {
+    RemoveOpenat2();
+    const FileTree tree(OpenRoot());
+    for (const Case& one : kCases) {
+      EXPECT_EQ(tree.Resolve(one.path).value_or("none"),
+                one.resolved == nullptr ? "none" : one.resolved)
+          << one.path;
+      EXPECT_EQ(tree.Exists(one.path), one.resolved != nullptr) << one.path;
+    }
+    EXPECT_EQ(tree.LinkType("/directory"), mode_t{S_IFLNK});
+  })));
+}
+
+TEST_F(FileTreeTest, FilesBeneathAreTheSameWithoutTheCall) {
+  const struct {
+    const char* path;
+    int flags;
+    int number;  // 0 where the file is opened
+  } cases[] = {
+      {"/", O_PATH, 0},
+      {"/etc/motd", O_RDONLY, 0},
+      {"/etc", O_RDONLY | O_DIRECTORY, 0},
+      {"/relative", O_PATH | O_NOFOLLOW, 0},
+      {"/relative", O_PATH, ELOOP},
+      {"/relative", O_RDONLY, ELOOP},
+      {"/directory/motd", O_RDONLY, ELOOP},
+      {"/absent", O_RDONLY, ENOENT},
+      {"/etc/motd/x", O_RDONLY, ENOTDIR},
+      {"/etc/../../root", O_PATH, EXDEV},
+      {"/..", O_PATH, EXDEV},
+  };
+  const auto expectAll = [&] {
+    const UniqueFd root = OpenRoot();
+    for (const auto& [path, flags, number] : cases) {
+      const UniqueFd file = OpenBeneath(root.Get(), path, flags);
+      const int reason = errno;
+      EXPECT_EQ(file.IsOpen(), number == 0) << path;
+      if (!file.IsOpen() && std::string(path).find("directory") == std::string::npos) {
+        EXPECT_EQ(reason, number) << path;
+      }
+    }
+  };
+  expectAll();
+  EXPECT_TRUE(ChildPassed(StartChild([&] {
+    RemoveOpenat2();
+    expectAll();
+  })));
 }
 
 TEST_F(FileTreeTest, MachineHasItsOwnPaths) {
