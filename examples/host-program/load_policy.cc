@@ -3,7 +3,8 @@
 //
 // Uses nothing but the installed headers and libraries:
 //
-//   c++ -std=c++20 load_policy.cc $(pkg-config --cflags --libs secpolicy secpolicy-host) -o load_policy
+//   c++ -std=c++20 -o load_policy load_policy.cc
+//     $(pkg-config --cflags --libs secpolicy secpolicy-host)
 //   ./load_policy HOST-DIRECTORY
 //
 // On a target, the lines that enter the stand-in host are left out: the process runs there already.
@@ -18,8 +19,8 @@
 namespace {
 
 void LoadAndTell(const char* directory) {
-  // For the rest of this process's life: its root directory is the host's, and what the library asks
-  // of the kernel is answered by the host's.
+  // For the rest of this process's life: its root directory is the host's, and what the library
+  // asks of the kernel is answered by the host's.
   StandIn::EnteredHost host(directory);
   host.BeginBatch();
   SecPolicy::LoadPolicy("/etc/olvane/secpolicy");
