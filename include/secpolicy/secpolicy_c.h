@@ -16,10 +16,10 @@
  * policy files that are not UTF-8 appear as U+FFFD in results. Positions in lines are in bytes.
  *
  * The calling process stays as it was. A host's kernel is an object in the caller's process and
- * thread: no child is made, and root directory, namespaces, filters, signal handlers, descriptors and
- * standard streams are not touched. Nothing is written to standard output or error; what a load logs
- * goes to the system log under the caller's own name. A write beyond the limit of file sizes fails
- * the call and raises no signal.
+ * thread: no child is made, and root directory, namespaces, filters, signal handlers, descriptors
+ * and standard streams are not touched. Nothing is written to standard output or error; what a load
+ * logs goes to the system log under the caller's own name. A write beyond the limit of file sizes
+ * fails the call and raises no signal.
  *
  * Threads. All functions may be called from several threads at once. A handle may be used by
  * several of them, but for its being freed. A call blocks its thread, which cannot be cancelled

@@ -4,8 +4,8 @@
 #include <string>
 #include <vector>
 
-#include "host/root/image_index.h"
 #include "host/root/file_tree.h"
+#include "host/root/image_index.h"
 
 namespace SecPolicyTool {
 
