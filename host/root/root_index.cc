@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <tuple>
 #include <utility>
 
 #include "host/module/module_error.h"
@@ -103,8 +104,9 @@ std::vector<RootIndex::Found> RootIndex::AllPaths() const {
     for (const std::string& path : content.paths) paths.push_back({path, content.name});
   }
   // Of a path that has both, the host's own comes first, and counts.
-  std::stable_sort(paths.begin(), paths.end(),
-                   [](const Found& a, const Found& b) { return a.path < b.path; });
+  std::sort(paths.begin(), paths.end(), [](const Found& a, const Found& b) {
+    return std::tie(a.path, a.tardisk) < std::tie(b.path, b.tardisk);
+  });
   return paths;
 }
 
