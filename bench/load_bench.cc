@@ -85,13 +85,13 @@ BENCHMARK(Records)->Name("load/records")->Apply(ForCounts);
 // ---- The kernel operations of the same load, with nothing around them --------------------------
 
 // The rules of one type in one domain, ready for the kernel.
-template <typename Type>
+template <typename Record>
 class Prepared {
  public:
   void Add(std::queue<std::string> words, unsigned int domain) {
-    typename Type::Record rule;
+    Record rule;
     rule.domainId = domain;
-    for (const auto& word : Type::kWords) {
+    for (const auto& word : kRow.Words()) {
       rule.*word.field = words.front();
       words.pop();
     }
@@ -100,22 +100,24 @@ class Prepared {
   }
 
   void Validate(ZekAccessInterfaceImpl& iface) {
-    for (typename Type::Record& rule : rules_) {
-      for (const auto& word : Type::kWords) {
-        if (word.taken != nullptr) word.taken(rule, iface);
-        if (word.list) iface.ValidateKeyword(*word.list, rule.*word.field);
+    for (Record& rule : rules_) {
+      for (const auto& word : kRow.Words()) {
+        if (word.domainId != nullptr) iface.FindDomain(rule.*word.field, &(rule.*word.domainId));
+        if (word.info.list) iface.ValidateKeyword(*word.info.list, rule.*word.field);
       }
     }
   }
 
   void Set(ZekAccessInterfaceImpl& iface) const {
-    for (const typename Type::Record& rule : rules_) (iface.*Type::kSet)(rule);
+    for (const Record& rule : rules_) (iface.*kRow.set)(rule);
   }
 
-  [[nodiscard]] const std::list<typename Type::Record>& Rules() const { return rules_; }
+  [[nodiscard]] const std::list<Record>& Rules() const { return rules_; }
 
  private:
-  std::list<typename Type::Record> rules_;
+  static constexpr const auto& kRow = ZekCtl::Security::kRuleRow<Record>;
+
+  std::list<Record> rules_;
 };
 
 class PreparedDomain {
