@@ -1,4 +1,4 @@
-// The description of the rule types, beside the words of its specification.
+// The description of the rule types, beside the words of policy files.
 #include "platform/rule_types.h"
 
 #include <gtest/gtest.h>
