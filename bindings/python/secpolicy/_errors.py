@@ -72,7 +72,7 @@ class OutOfMemoryError(SecPolicyError, MemoryError):
 
 
 class SystemFailure(SecPolicyError):
-    """The process that was to do the work could not be made, or came to no end of its own."""
+    """The system failed in a way that no other exception names."""
 
     status = 7
 
